@@ -1,0 +1,47 @@
+#pragma once
+
+#include <cstddef>
+#include <filesystem>
+#include <string>
+#include <string_view>
+
+namespace base
+{
+
+/// A file that appears under its name whole or not at all.
+///
+/// What is written goes to a temporary file in the same folder; `Commit` flushes it to the disk and renames it. Without
+/// a commit (an error, an early return) the temporary file is removed and an older file of that name stays untouched.
+/// The first failure is kept and everything after it does nothing.
+class AtomicFile
+{
+public:
+    explicit AtomicFile(std::filesystem::path path);
+    ~AtomicFile();
+    AtomicFile(const AtomicFile&) = delete;
+    AtomicFile& operator=(const AtomicFile&) = delete;
+
+    bool Write(const void* data, std::size_t size);
+    bool Write(std::string_view text) { return Write(text.data(), text.size()); }
+
+    /// Overwrites bytes written before, for a header that counts what follows it.
+    bool WriteAt(std::size_t offset, const void* data, std::size_t size);
+
+    bool Commit();
+
+    /// "out/run.mdf: No space left on device", or empty while all went well.
+    const std::string& Error() const { return error; }
+
+private:
+    bool Fail(const char* what);
+
+    std::filesystem::path path;
+    std::filesystem::path temporary;
+    int file = -1;
+    std::string error;
+};
+
+/// Writes `content` as the whole of `path`. Empty on success, else the reason with the path.
+std::string WriteWholeFile(const std::filesystem::path& path, std::string_view content);
+
+} // namespace base

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+namespace host
+{
+
+/// What a file dialog is asked for.
+struct FileQuestion
+{
+    std::wstring title;
+    std::wstring filter;           ///< "Motion Data file (*.mdf)|*.mdf||"
+    std::wstring defaultExtension; ///< "mdf", appended to a name without one
+    std::wstring initialName;
+};
+
+/// Questions to the user. Nothing as an answer means that the user declined, or that nobody is there to ask.
+class Questions
+{
+public:
+    virtual ~Questions() = default;
+
+    /// A path to write to, in the inner form.
+    virtual std::optional<std::wstring> AskSaveFile(const FileQuestion& question) = 0;
+
+    /// A path of a file that exists, in the inner form.
+    virtual std::optional<std::wstring> AskOpenFile(const FileQuestion& question) = 0;
+};
+
+} // namespace host
