@@ -17,10 +17,12 @@ class Texts;
 
 namespace osg
 {
+class Drawable;
 class Group;
 class Node;
 } // namespace osg
 
+class VtC3DMovableBody;
 class VtCScene3D;
 class VtISceneObjectStore;
 
@@ -43,6 +45,10 @@ public:
     /// Gives the node, or its drawables, the program `shaderName`; a missing shader file leaves them without.
     virtual void assignShader(osg::Node* node, const std::wstring& shaderName, const std::wstring& vertexPath,
                               const std::wstring& fragmentPath) = 0;
+
+    /// The same for one drawable alone.
+    virtual void assignDrawableShader(osg::Drawable* drawable, const std::wstring& shaderName,
+                                      const std::wstring& vertexPath, const std::wstring& fragmentPath) = 0;
 
     /// One shader parameter of a model's description; combinations that aren't known are ignored.
     virtual void setShaderParameter(osg::Node* node, const std::wstring& kind, const std::wstring& name,
@@ -72,6 +78,9 @@ public:
 
     /// Moves every observer to where its body is now, in collection order.
     virtual void UpdateObservers() = 0;
+
+    /// `body` is about to go: observers that ride on it stay where they are, not connected.
+    virtual void ReleaseBody(VtC3DMovableBody& body) = 0;
 };
 
 /// What objects of a scene need from outside; made once by the application object.

@@ -1,0 +1,121 @@
+#pragma once
+
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <osg/ref_ptr>
+
+#include "scene/AbstractObject.h"
+#include "scene/PGEventSink.h"
+#include "scene/SceneObject.h"
+
+class VtISceneDocument;
+struct VtTSceneServices;
+
+/// An object with an identity, a place in the object tree and a record in the attribute store.
+///
+/// A parent holds the one lasting reference to each of its children; an object made without a parent belongs to who
+/// made it. All persistent state changes one way: a write to the record ends in `OnAttributeChanged`, and loading is
+/// the replaying of a stored record through the same handler.
+class VtCGlidePanelAbstractNavigatorObject : public VtCGlidePanelAbstractObject
+{
+public:
+    using Objects = std::vector<VtCGlidePanelAbstractNavigatorObject*>;
+
+    virtual void SetModified();
+
+    /// Format of the object's section in a settings file, empty for objects without one.
+    virtual std::wstring GetSectionFormat() const { return {}; }
+
+    /// Merges `source` into the object's own record and applies every attribute, in the order of `source`.
+    virtual void ApplyAttributes(VtISceneObject& source);
+
+    /// A new default record of the type of `source` with every value of `source` that it has room for; null when
+    /// the type has no default record.
+    virtual osg::ref_ptr<VtISceneObject> CopyAttributes(const VtISceneObject& source) const;
+
+    virtual osg::ref_ptr<VtISceneObject> GetAttributeObject() const { return attributeObject; }
+
+    /// Ends the event connection and takes the record out of the store; the object keeps its reference to it.
+    virtual void RemoveAttributeObject();
+
+    /// The one handler of attribute changes. The base knows `name`; other names are ignored, and so is a value of
+    /// another type than the attribute's.
+    virtual void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                                    const VtTAttributeValue& value);
+
+    /// The name shown in the tree, and its record's `name`.
+    const std::wstring& GetName() const { return displayName; }
+    const std::wstring& GetInternalId() const { return internalId; }
+
+    /// Null at the top, and after the parent let go.
+    VtCGlidePanelAbstractNavigatorObject* GetParent() const { return parent; }
+
+    const Objects& GetChildren() const { return children; }
+
+    void AddChild(VtCGlidePanelAbstractNavigatorObject& child);
+
+    /// Gives back the reference to `child`, which usually is its end. A stranger is ignored.
+    void RemoveChild(VtCGlidePanelAbstractNavigatorObject& child);
+    void DetachFromParent();
+
+    /// All objects below this one, each followed by its own descendants.
+    void CollectDescendants(Objects& descendants) const;
+
+    /// The first descendant of that name or id, depth first, without regard to case; null when there is none.
+    VtCGlidePanelAbstractNavigatorObject* FindByName(std::wstring_view name) const;
+    VtCGlidePanelAbstractNavigatorObject* FindById(std::wstring_view id) const;
+    bool IsNameFree(std::wstring_view name) const { return !FindByName(name); }
+
+    /// Lets go of the present record and takes over the one that the store holds under `newId`, with its id. Without
+    /// such a record the object has none from then on.
+    void RebindAttributes(const std::wstring& newId);
+
+    /// True while a loader applies a stored record.
+    bool IsLoading() const { return loading; }
+    void SetLoading(bool flag) { loading = flag; }
+
+    /// True while the object writes to its own record.
+    bool IsWritingAttributes() const { return writing > 0; }
+
+    VtISceneDocument& GetDocument() const { return *document; }
+    VtTSceneServices& GetServices() const;
+
+protected:
+    /// An empty `id` is replaced by a fresh one. With a parent, the reference of creation is given up to it.
+    VtCGlidePanelAbstractNavigatorObject(VtISceneDocument& owningDocument,
+                                         VtCGlidePanelAbstractNavigatorObject* parentObject, const std::wstring& name,
+                                         bool inTree, const std::wstring& id);
+    ~VtCGlidePanelAbstractNavigatorObject() override;
+
+    /// Sets or adds an attribute of the own record without hearing of it; nothing without a record.
+    void WriteAttribute(const std::wstring& name, VtTAttributeValue value);
+
+    /// Adds an attribute to the own record unless it is there, with the text of its value.
+    void AddMissingAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name);
+
+    /// Listens to the record from now on and puts it into the store. Nothing without a record.
+    void PublishAttributes();
+
+    /// Called when a child has left the list; its derived parts may be gone.
+    virtual void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child);
+
+    void SetDisplayName(const std::wstring& name) { displayName = name; }
+
+    std::wstring internalId;
+    std::unique_ptr<VTIPGEventSink> attributeSink;
+    osg::ref_ptr<VtISceneObject> attributeObject; ///< null: writes to it are skipped
+
+private:
+    void Forget(VtCGlidePanelAbstractNavigatorObject& child);
+    void MergeAttribute(const std::wstring& name, const VtTAttributeValue& value);
+
+    std::wstring displayName;
+    bool loading = false;
+    int writing = 0;
+    VtISceneDocument* document;
+    VtCGlidePanelAbstractNavigatorObject* parent = nullptr;
+    Objects children;
+};

@@ -1,0 +1,42 @@
+#include "scene/MaterialCollector.h"
+
+VtCOsgMatMapObject::VtCOsgMatMapObject(osg::Material& source)
+    : material(&source),
+      diffuse(source.getDiffuse(osg::Material::FRONT)),
+      specular(source.getSpecular(osg::Material::FRONT)),
+      ambient(source.getAmbient(osg::Material::FRONT)),
+      shininess(source.getShininess(osg::Material::FRONT))
+{
+}
+
+VtCOsgMatMapObject::VtCOsgMatMapObject(const VtCOsgMatMapObject& other)
+    : osg::Referenced(),
+      material(other.material),
+      diffuse(other.diffuse),
+      specular(other.specular),
+      ambient(other.ambient),
+      shininess(other.shininess)
+{
+}
+
+VtTMaterialMap CopyRecords(const VtTMaterialMap& source)
+{
+    VtTMaterialMap copy;
+    for (const auto& [drawable, record] : source)
+        copy.emplace_hint(copy.end(), drawable, new VtCOsgMatMapObject(*record));
+    return copy;
+}
+
+void VtCOsgNodeMaterialCollector::apply(osg::Geode& geode)
+{
+    for (unsigned i = 0; i < geode.getNumDrawables(); ++i)
+    {
+        osg::Drawable* drawable = geode.getDrawable(i);
+        osg::StateSet* stateSet = drawable ? drawable->getStateSet() : nullptr;
+        if (!stateSet)
+            continue;
+        if (auto* material = dynamic_cast<osg::Material*>(stateSet->getAttribute(osg::StateAttribute::MATERIAL)))
+            materials[drawable] = new VtCOsgMatMapObject(*material);
+    }
+    traverse(geode);
+}

@@ -1,0 +1,130 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "scene/AffineProduct.h"
+#include "scene/Body.h"
+
+class VtCMovableBodies;
+class VtCTrack;
+
+/// A body that simulation data move.
+///
+/// `scale`, `rotation` and `center` only place the model at the simulated origin; the matrix of a frame moves it from
+/// there. Models are y-up and the scene is z-up, so a quarter turn about x is always part of the placement.
+class VtC3DMovableBody final : public VtC3DBody
+{
+public:
+    enum VtEConnectionState : std::int32_t
+    {
+        notConnected = 0,
+        channelMissing = 1, ///< a channel is set, but the current data point has none of that index
+        connected = 2,
+    };
+
+    /// Belongs to `parent` (a collection, or the group that it becomes a part of). `path` is a complete path;
+    /// `insertTransform` places a grouped body as a whole; `model` is used in place of the file if it isn't null. An
+    /// empty `id` gives a fresh one. A file that can't be read leaves the body without geometry.
+    VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
+                     const std::wstring& name, const std::wstring& path, const osg::Matrixd& insertTransform,
+                     bool inTree, osg::Node* model, const std::wstring& id);
+
+    /// Binds the body to the channel `index`, -1 for none. An empty `stream` is named by the data point, or by the
+    /// index. A group ignores it: its parts have channels of their own.
+    void ConnectChannel(std::int32_t index, const std::wstring& stream);
+
+    std::int32_t GetSimulationDataIndex() const { return simulationDataIndex; }
+    const std::wstring& GetSimulationDataStream() const { return simulationDataStream; }
+    bool IsConnected() const { return simulationDataIndex != -1; }
+
+    /// Compares the channel with those of the current data point; a group asks its parts.
+    void UpdateConnectionState();
+    std::int32_t GetConnectionState() const { return connectionState; }
+
+    /// Moves the body by a frame's matrix; (3,3) of it counts as 1.
+    void SetLastTransformMatrix(const osg::Matrixd& matrix)
+    {
+        lastTransformMatrix = matrix;
+        lastTransformMatrix(3, 3) = 1.0;
+        ApplyTransform();
+    }
+
+    /// The same with the 16 floats of a frame's entry, column after column.
+    void SetLastTransformColumns(const float* values)
+    {
+        double* m = lastTransformMatrix.ptr();
+        for (int row = 0; row < 4; ++row)
+            for (int column = 0; column < 4; ++column)
+                m[row * 4 + column] = values[column * 4 + row];
+        m[15] = 1.0;
+        ApplyTransform();
+    }
+
+    const osg::Matrixd& GetLastTransformMatrix() const { return lastTransformMatrix; }
+
+    /// Sets the node to `baseMatrix` * `lastTransformMatrix`; a group hands it to its parts.
+    void ApplyTransform() override
+    {
+        if (matrixNode && !isGrouped && IsAffine(lastTransformMatrix))
+        {
+            osg::Matrixd placed(baseMatrix); // any value will do; the default constructor is a call
+            AffineProduct(baseMatrix, lastTransformMatrix, placed);
+            matrixNode->setMatrix(placed);
+        }
+        else
+            ApplyAnyTransform();
+    }
+
+    void SetTransform(const osg::Matrixd& matrix) override;
+    void UpdateBaseTransform() override;
+
+    /// Writes the matrix of the node to `last_transform_matrix`, for a scene about to be saved; a group does so for
+    /// its parts too. A matrix that holds no finite numbers isn't written.
+    void StoreLastTransform();
+
+    const osg::Matrixd& GetInsertMatrix() const { return insertMatrix; }
+    void SetInsertMatrix(const osg::Matrixd& matrix);
+
+    const osg::Matrixd& GetGroupChildMatrix() const { return groupChildMatrix; }
+
+    /// The parts of a group, in the order of `childIds`.
+    const std::vector<VtC3DMovableBody*>& GetParts() const { return parts; }
+
+    /// A body that replays this one in `clonesTrack` (not owned), member of `target`; null without a model to copy.
+    VtC3DMovableBody* CloneIntoTrack(VtCMovableBodies& target, VtCTrack* clonesTrack, std::int32_t trackNumber);
+
+    VtC3DMovableBody* GetCloneSource() const { return cloneSource; }
+    VtCTrack* GetTrack() const { return track; }
+    bool IsClone() const { return track != nullptr; }
+
+    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
+    void FinishLoad(const std::wstring& id);
+
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+
+protected:
+    ~VtC3DMovableBody() override;
+    void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child) override;
+
+private:
+    void ApplyAnyTransform();
+    void FillAttributes(const osg::Matrixd& insertTransform);
+    void ExpandGroup();
+    void AddPart(const std::wstring& oldId, const std::wstring& newId, const std::wstring& path);
+    void MoveAttribute(const std::wstring& oldName, const std::wstring& newName);
+    void OnChannelNameChanged(const std::wstring& name);
+
+    std::int32_t simulationDataIndex = -1;
+    osg::Matrixd lastTransformMatrix;
+
+    std::int32_t connectionState = notConnected;
+    std::wstring simulationDataStream;
+    osg::Matrixd groupChildMatrix; ///< of a part: its place inside the group
+    osg::Matrixd insertMatrix;     ///< of a group: the place of the whole
+    std::vector<VtC3DMovableBody*> parts;
+    VtC3DMovableBody* cloneSource = nullptr; ///< not owned
+    VtCTrack* track = nullptr;               ///< not owned
+};

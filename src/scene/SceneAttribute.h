@@ -1,0 +1,77 @@
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+#include <osg/Referenced>
+
+class VtISceneObject;
+
+using VtTFloatTupel3 = std::array<float, 3>;
+using VtTIntTupel3 = std::array<std::int32_t, 3>;
+
+/// The value of an attribute. Truth values are the integers 0 and 1.
+using VtTAttributeValue = std::variant<std::int32_t, float, std::wstring, VtTFloatTupel3, VtTIntTupel3,
+                                       std::vector<float>, std::vector<std::wstring>>;
+
+/// Kinds of attributes, numbered as the alternatives of `VtTAttributeValue`.
+enum class VtEAttributeType
+{
+    integer,     ///< "int"
+    real,        ///< "float"
+    text,        ///< "string"
+    floatTupel3, ///< "floatTupel3"
+    intTupel3,   ///< "intTupel3"
+    floatList,   ///< "floatList"
+    textList,    ///< "stringList"
+};
+
+/// What an attribute or a record refuses: an unknown type name, a text that isn't a value of the type, a value of
+/// another type, a number that isn't finite. `what()` is UTF-8 for the user.
+class VtCAttributeError : public std::runtime_error
+{
+public:
+    using std::runtime_error::runtime_error;
+};
+
+/// The name of `type` in records, and back; an unknown name throws `VtCAttributeError`.
+std::wstring_view AttributeTypeName(VtEAttributeType type);
+VtEAttributeType AttributeTypeFromName(std::wstring_view typeName);
+
+/// The value that `text` stands for. Numbers are decimal with a point, those of a tuple or list separated by blanks;
+/// a list of texts has one entry a line. Throws `VtCAttributeError` when `text` isn't such a value.
+VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::wstring_view text);
+
+/// The text that reads back as the same value; a list of texts only when no entry holds a line end.
+std::wstring AttributeValueToText(const VtTAttributeValue& value);
+
+/// One named value of a record. The type is fixed when it is made.
+class VtISceneAttribute : public osg::Referenced
+{
+public:
+    VtISceneAttribute(std::wstring attributeName, VtTAttributeValue attributeValue);
+
+    const std::wstring& GetName() const { return name; }
+    VtEAttributeType GetType() const { return static_cast<VtEAttributeType>(value.index()); }
+    std::wstring GetTypeName() const { return std::wstring(AttributeTypeName(GetType())); }
+    const VtTAttributeValue& GetValue() const { return value; }
+    std::wstring GetValueText() const { return AttributeValueToText(value); }
+
+    /// Stores `newValue` and, if it differs from the present one, tells the listeners of the record.
+    ///
+    /// An integer is taken for a float attribute; any other value of a foreign type throws `VtCAttributeError`, and
+    /// so do numbers that aren't finite, since no record could be read back with them.
+    void SetValue(VtTAttributeValue newValue);
+
+private:
+    friend class VtISceneObject;
+
+    std::wstring name;
+    VtTAttributeValue value;
+    VtISceneObject* owner = nullptr; ///< null once the record has let it go
+};

@@ -1,0 +1,86 @@
+#include "scene/StaticBody.h"
+
+void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                                         const VtTAttributeValue& value)
+{
+    const std::int32_t* integer = std::get_if<std::int32_t>(&value);
+    const float* real = std::get_if<float>(&value);
+    const VtTFloatTupel3* vector = std::get_if<VtTFloatTupel3>(&value);
+
+    if (integer &&
+        (attributeName == L"selectable" || attributeName == L"fixed_to_world" || attributeName == L"visible"))
+    {
+        VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
+        SetModified();
+    }
+    else if (attributeName == L"transparency" && real)
+    {
+        if (GetGlobalMode() != VtERenderMode::Mixed)
+            return;
+        SetTransparency(*real);
+        if (dye->enabled != 0)
+            ApplyStoredDye();
+        ApplyTransparency(GetRenderMode());
+    }
+    else if (attributeName == L"position" && vector)
+    {
+        const osg::Vec3f axes = ToModelAxes(*vector);
+        SetPositionX(axes.x());
+        SetPositionY(axes.y());
+        SetPositionZ(axes.z());
+    }
+    else if (attributeName == L"center" && vector)
+    {
+        const osg::Vec3f axes = ToModelAxes(*vector);
+        SetCenterX(axes.x());
+        SetCenterY(axes.y());
+        SetCenterZ(axes.z());
+    }
+    else if (attributeName == L"rotation" && vector)
+    {
+        const osg::Vec3f axes = ToModelAxes(*vector);
+        SetRotationX(axes.x());
+        SetRotationY(axes.y());
+        SetRotationZ(axes.z());
+    }
+    else if (attributeName == L"scale" && vector)
+    {
+        const osg::Vec3f percent = ToModelScale(*vector);
+        SetScaleX(percent.x());
+        SetScaleY(percent.y());
+        SetScaleZ(percent.z());
+    }
+    else if (attributeName == L"scale_orient" && vector)
+        SetScaleOrientation(ToModelAxes(*vector));
+    else if (attributeName == L"render_mode" && integer)
+    {
+        SetRenderMode(static_cast<VtERenderMode>(*integer));
+        if (dye->enabled != 0)
+        {
+            ApplyStoredDye();
+            ApplyTransparency(GetRenderMode());
+        }
+    }
+    else if (attributeName == L"dye_enabled" && integer)
+    {
+        dye->enabled = *integer > 0 ? 1 : 0;
+        RefreshAppearance();
+        SetModified();
+    }
+    else if (const auto* colour = std::get_if<VtTIntTupel3>(&value); colour && attributeName == L"dye_color")
+    {
+        StoreDyeColour(*colour);
+        if (dye->enabled != 0)
+        {
+            ApplyStoredDye();
+            ApplyTransparency(GetRenderMode());
+        }
+        SetModified();
+    }
+    else
+    {
+        if (isGrouped)
+            OnChildAttributeChanged(attributeName, value);
+        VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
+    }
+}
