@@ -91,7 +91,7 @@ public:
         for (std::size_t pose = 0; pose < columns.poses.size(); ++pose)
             if (std::wstring fault = PoseFault(pose); !fault.empty())
                 return fault;
-        if (const std::wstring fault = columns.channels.Fault(); !fault.empty())
+        if (std::wstring fault = columns.channels.Fault(); !fault.empty())
             return fault;
         return {};
     }

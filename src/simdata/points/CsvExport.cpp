@@ -164,7 +164,7 @@ bool VtCMotionDataCsv::Export(const std::filesystem::path& motionData, const std
             const std::wstring fault = rows.Add(chunk.data() + index * channels.Stride(), ++report.frames);
             if (!fault.empty())
             {
-                report.error = name + L": " + fault;
+                report.error = fmt::format(L"{}: {}", name, fault);
                 return false;
             }
             if (rows.text.size() >= blockBytes)
@@ -194,7 +194,7 @@ bool VtCMotionDataCsv::Export(const std::filesystem::path& motionData, const std
     if (progress != nullptr)
         progress->OnLoadProgress(activity, total, total);
     for (const std::wstring& damage : reader.GetDamage().Texts())
-        report.warnings.push_back(name + L": " + damage);
+        report.warnings.push_back(fmt::format(L"{}: {}", name, damage));
     if (rows.roundedPoses > 0)
         report.warnings.push_back(fmt::format(L"{}: {} poses are rigid only to {}, first in frame {}; they were "
                                               L"written as the nearest rotation",

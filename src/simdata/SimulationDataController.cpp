@@ -1,0 +1,264 @@
+#include "simdata/SimulationDataController.h"
+
+#include <algorithm>
+
+#include "base/Text.h"
+#include "host/Storage.h"
+#include "simdata/SimulationDataChangeObject.h"
+
+namespace
+{
+
+// Without a host that keeps them: 100 s of a run at 100 Hz, and twice that for all tracks together.
+constexpr std::int32_t defaultSimulationFrames = 10000;
+constexpr std::int32_t defaultTrackFrames = 20000;
+
+} // namespace
+
+VtCSimulationDataController::VtCSimulationDataController(const VtTSimulationServices& hostServices)
+    : services(hostServices),
+      router(hostServices),
+      runningIndicator(hostServices.variables, hostServices.navigator)
+{
+    ReadBufferSettings();
+    router.SetFrameBufferSize(static_cast<unsigned long>(simulationBufferFrames));
+}
+
+VtCSimulationDataController::~VtCSimulationDataController()
+{
+    if (auto* point = router.FindPoint(selectedPoint))
+        point->OnDeselect();
+}
+
+void VtCSimulationDataController::ReadBufferSettings()
+{
+    const host::Configuration* configuration = services.configuration;
+    simulationBufferFrames =
+        std::max(configuration ? configuration->GetSimulationBufferFrames() : defaultSimulationFrames,
+                 GetMinimumBufferFrames());
+    trackBufferFrames = std::max(configuration ? configuration->GetTrackBufferFrames() : defaultTrackFrames, 0);
+}
+
+void VtCSimulationDataController::Start()
+{
+    if (!router.GetActivePoint(0))
+        return;
+    SetMode(VtESimulationMode::Online);
+    UpdateRunningIndicator();
+}
+
+void VtCSimulationDataController::Stop()
+{
+    SetMode(VtESimulationMode::Offline);
+    UpdateRunningIndicator();
+}
+
+void VtCSimulationDataController::Reset()
+{
+    if (IsOnline())
+        SetMode(VtESimulationMode::Offline);
+    else if (IsPlaying())
+        playState = VtEPlayState::PlayStopped;
+    router.Clear();
+}
+
+void VtCSimulationDataController::SetMode(VtESimulationMode newMode)
+{
+    if (newMode == mode)
+        return;
+    router.ResetMessageStack();
+    mode = newMode;
+    if (mode == VtESimulationMode::Offline)
+        router.DisconnectAll();
+    else if (router.ConnectAll())
+        router.RefreshChannelLists(0);
+    else
+        mode = VtESimulationMode::Offline;
+    router.ReportMessages();
+}
+
+void VtCSimulationDataController::SetModeQuietly(VtESimulationMode newMode)
+{
+    if (newMode == VtESimulationMode::Offline)
+    {
+        mode = newMode;
+        router.NotifyMode(mode);
+        return;
+    }
+    // `Start` stores the mode itself, since it connects only on a change.
+    Start();
+    router.NotifyMode(mode);
+}
+
+bool VtCSimulationDataController::Step()
+{
+    router.GetClock().TickClock();
+    if (IsOnline())
+    {
+        if (router.FetchFrames())
+            return true;
+        router.ReportMessages();
+        return false;
+    }
+    if (HasPlayState() && !StepReplay() && HasPlayState())
+    {
+        playState = VtEPlayState::PlayStopped;
+        router.NotifyPlayState(playState);
+        UpdateRunningIndicator();
+    }
+    return true;
+}
+
+bool VtCSimulationDataController::StepReplay()
+{
+    switch (playState)
+    {
+    case VtEPlayState::PlayOnce:
+        if (router.GotoTime())
+            return true;
+        router.GotoLast();
+        return false;
+    case VtEPlayState::PlayLoop:
+        return router.GotoTime() || router.ShowFrame({}, 1);
+    case VtEPlayState::SpoolBackward:
+        return router.RewindStep();
+    case VtEPlayState::SpoolForward:
+        return router.ForwardStep();
+    case VtEPlayState::PlayStopped:
+        break;
+    }
+    return true;
+}
+
+void VtCSimulationDataController::PlayOnce()
+{
+    Play(VtEPlayState::PlayOnce);
+}
+
+void VtCSimulationDataController::PlayLoop()
+{
+    Play(VtEPlayState::PlayLoop);
+}
+
+void VtCSimulationDataController::Play(VtEPlayState state)
+{
+    if (!IsOnline())
+        playState = state;
+    if (auto* point = router.GetActivePoint(0))
+    {
+        const bool loops = state == VtEPlayState::PlayLoop;
+        point->SetFrameBufferRepeat(loops ? 1 : 0);
+        double time = 0.0;
+        if (point->GetTimestampsSupported() && point->GetTimeStampOfCurrentElement(time))
+        {
+            double earliest = time;
+            double latest = time;
+            if (loops && point->GetFrameBufferEarliestTime(earliest) && point->GetFrameBufferLatestTime(latest))
+                router.GetClock().StartLoopClock(earliest, latest, time, speed);
+            else
+            {
+                // A time-driven point's connection, or a recording, may have left a speed of its own.
+                router.GetClock().SetSpeed(speed);
+                router.GetClock().StartOneWayClock(time);
+            }
+        }
+    }
+    router.NotifyPlayState(playState);
+    UpdateRunningIndicator();
+}
+
+void VtCSimulationDataController::StopPlay()
+{
+    if (HasPlayState())
+    {
+        playState = VtEPlayState::PlayStopped;
+        router.NotifyPlayState(playState);
+    }
+    UpdateRunningIndicator();
+}
+
+void VtCSimulationDataController::SetPlayState(const std::wstring& name, VtEPlayState state)
+{
+    if (!name.empty() && !IsOnline())
+        playState = state;
+}
+
+void VtCSimulationDataController::PlayForRecording(double start, double speedFactor)
+{
+    if (!IsOnline())
+        playState = VtEPlayState::PlayLoop;
+    router.GetClock().StartScaledClock(start, speedFactor);
+}
+
+void VtCSimulationDataController::SetSpeed(double factor)
+{
+    speed = factor;
+    router.GetClock().SetSpeed(factor);
+}
+
+bool VtCSimulationDataController::GotoNext(const std::wstring& name)
+{
+    return !IsOnline() && !HasPlayState() && router.GotoNext(name);
+}
+
+bool VtCSimulationDataController::GotoPrevious(const std::wstring& name)
+{
+    return !IsOnline() && !HasPlayState() && router.GotoPrevious(name);
+}
+
+void VtCSimulationDataController::Refresh()
+{
+    router.NotifyMode(VtESimulationMode::Online);
+    router.FetchOnce();
+    router.NotifyMode(mode);
+}
+
+int VtCSimulationDataController::GetFrameBufferSize() const
+{
+    const auto* point = router.GetActivePoint(0);
+    return point ? point->GetFrameBufferSizeEx() : 0;
+}
+
+std::unique_ptr<SimulationDataPoints::VtCSimulationDataFrames> VtCSimulationDataController::CopyFrameBuffer() const
+{
+    const auto* point = router.GetActivePoint(0);
+    if (!point || point->GetFrameBufferSizeEx() <= 0)
+        return nullptr;
+    return std::unique_ptr<SimulationDataPoints::VtCSimulationDataFrames>(point->CopySimulationFrameBuffer());
+}
+
+SimulationDataPoints::TRACK_SAFETY VtCSimulationDataController::GetTrackSafety() const
+{
+    const auto* point = router.GetActivePoint(0);
+    return point ? point->GetFrameBufferTrackSafety() : SimulationDataPoints::TRACK_UNSAFE;
+}
+
+bool VtCSimulationDataController::SetBufferSizes(std::int32_t simulationFrames, std::int32_t trackFrames)
+{
+    if (simulationFrames == simulationBufferFrames && trackFrames == trackBufferFrames)
+        return false;
+    simulationBufferFrames = simulationFrames;
+    trackBufferFrames = trackFrames;
+    if (services.configuration)
+    {
+        services.configuration->SetSimulationBufferFrames(simulationFrames);
+        services.configuration->SetTrackBufferFrames(trackFrames);
+    }
+    return true;
+}
+
+void VtCSimulationDataController::ChoosePoint(const std::wstring& name)
+{
+    if (!base::EqualsNoCase(name, selectedPoint))
+    {
+        if (auto* old = router.FindPoint(selectedPoint))
+            old->OnDeselect();
+        selectedPoint = name;
+        if (auto* chosen = router.FindPoint(name))
+            chosen->OnSelect();
+    }
+    if (name.empty())
+        router.DeselectPoint(router.GetActivePointName(0));
+    else
+        router.SelectPoint(name);
+}
