@@ -1,0 +1,449 @@
+#include "interaction/Observer.h"
+
+#include <algorithm>
+#include <cstdio>
+
+#include <osgViewer/View>
+
+#include "base/Maths.h"
+#include "base/Numbers.h"
+#include "base/Text.h"
+#include "interaction/InteractionServices.h"
+#include "interaction/Observers.h"
+#include "interaction/SettingsAccess.h"
+#include "scene/EulerAngles.h"
+#include "scene/MovableBody.h"
+#include "scene/RecordTables.h"
+#include "scene/Scene3D.h"
+#include "scene/SceneObjectStore.h"
+#include "scene/SceneServices.h"
+
+namespace
+{
+
+constexpr double quarterTurn = 1.5707963267948966;
+const std::wstring notConnectedText = L"Not connected";
+const std::wstring fixedToBodyName = L"Fixed_to_Body";
+const std::wstring fixedToObjectName = L"Fixed_to_Object";
+
+const osg::Vec3d xAxis(1, 0, 0);
+const osg::Vec3d yAxis(0, 1, 0);
+const osg::Vec3d zAxis(0, 0, 1);
+
+VtTFloatTupel3 Tupel(const osg::Vec3f& vector)
+{
+    return {vector.x(), vector.y(), vector.z()};
+}
+
+// The turn about the vertical from the x axis into `direction`; none when that has no horizontal part.
+osg::Quat HeadTurn(const osg::Vec3d& direction)
+{
+    osg::Vec3d heading(direction.x(), direction.y(), 0);
+    osg::Quat turn;
+    if (heading.normalize() > 0)
+        turn.makeRotate(xAxis, heading);
+    return turn;
+}
+
+osg::Vec3f Vector(const VtTFloatTupel3& tupel)
+{
+    return {tupel[0], tupel[1], tupel[2]};
+}
+
+// The record's angles turn about axes that turn with each step: y, then the turned z, then the turned x.
+osg::Quat RotationFromRecord(const VtTFloatTupel3& angles)
+{
+    const osg::Quat first((angles[2] - 90.0) * osg::PI / 180.0, yAxis);
+    const osg::Quat second(-base::RadiansFromDegrees(angles[0]), first * zAxis);
+    const osg::Quat third(base::RadiansFromDegrees(90.0 - angles[1]), second * (first * xAxis));
+    return first * second * third;
+}
+
+// The inverse of it, from the rotation of the camera.
+VtTFloatTupel3 RecordFromCameraRotation(const osg::Quat& cameraRotation)
+{
+    const osg::Vec3f angles = EulerAngles(cameraRotation);
+    return {angles.y(), 90.0f - angles.x(), angles.z() + 90.0f};
+}
+
+} // namespace
+
+VtC3DObserver::VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection,
+                             const std::wstring& name, bool inTree, bool freeByBirth, const std::wstring& id)
+    : VtC3DBody(owningDocument, &parentCollection, name, {}, inTree, freeByBirth ? name : id),
+      collection(parentCollection),
+      isFree(freeByBirth),
+      followModeName(parentCollection.GetFollowModeName(followFixed)),
+      follower(parentCollection.GetClock())
+{
+    Place({offsetTranslation, osg::Quat()});
+    MakeRecord(freeByBirth);
+    if (freeByBirth)
+        ReadFirstPlacement();
+    PublishAttributes();
+}
+
+VtC3DObserver::~VtC3DObserver()
+{
+    if (connectedBody)
+        connectedBody->Release();
+}
+
+void VtC3DObserver::MakeRecord(bool freeByBirth)
+{
+    attributeObject = MakeDefaultObject(freeByBirth ? objectTypeDefaultObserver : objectTypeObserver);
+    WriteAttribute(L"internal_id", GetInternalId());
+    WriteAttribute(L"name", GetName());
+    AddMissingAttribute(L"floatTupel3", L"0 0 0", L"position");
+    AddMissingAttribute(L"floatTupel3", L"0 0 0", L"orientation");
+    WriteAttribute(L"translation", Tupel(offsetTranslation));
+    WriteAttribute(L"rotation", Tupel(offsetAngles));
+}
+
+void VtC3DObserver::ReadFirstPlacement()
+{
+    if (!attributeObject)
+        return;
+    if (const auto* eye = attributeObject->Find<VtTFloatTupel3>(L"position"))
+        setPosition(Vector(*eye), true);
+    if (const auto* angles = attributeObject->Find<VtTFloatTupel3>(L"orientation"))
+        setRotation(RotationFromRecord(*angles), true);
+}
+
+void VtC3DObserver::Update()
+{
+    if (cameras.empty() || !assigned)
+        return;
+    if (followMode == followFixed)
+    {
+        Place({offsetTranslation, osg::Quat()});
+        // falls through to the rules that need a body: without one this is all
+    }
+    if (!connectedBody)
+        return;
+
+    const osg::Matrixd& body = connectedBody->GetLastTransformMatrix();
+    const osg::Vec3d at = body.getTrans();
+    switch (followMode)
+    {
+    case followRigid:
+        Place(FollowRigid(body));
+        break;
+    case followHeading:
+        Place(FollowHeading(body));
+        break;
+    case followSmooth:
+    {
+        Placement placement = FollowRigid(body);
+        VtCFollowData current;
+        current.position = placement.position;
+        current.rotation = placement.rotation;
+        VtCFollowData calmed;
+        follower.Follow(current, calmed);
+        placement.rotation = calmed.rotation;
+        Place(placement);
+        break;
+    }
+    case followLookAt:
+        Place(LookAt(body));
+        break;
+    case followPosition:
+        Place({osg::Vec3f(at + osg::Vec3d(offsetTranslation)), osg::Quat()});
+        break;
+    case followAlongX:
+        Place({osg::Vec3f(at.x(), offsetTranslation.y(), at.z() + offsetTranslation.z()), osg::Quat()});
+        break;
+    case followAlongY:
+        Place({osg::Vec3f(offsetTranslation.x(), at.y(), at.z() + offsetTranslation.z()), osg::Quat()});
+        break;
+    default:
+        break;
+    }
+    if (collection.GetInteraction().GetActiveObserver() == this)
+        collection.GetInteraction().SetHeadLightPosition(position);
+}
+
+VtC3DObserver::Placement VtC3DObserver::FollowRigid(const osg::Matrixd& body) const
+{
+    const osg::Matrixd placed = osg::Matrixd::translate(offsetTranslation) * body;
+    return {osg::Vec3f(placed.getTrans()), placed.getRotate()};
+}
+
+VtC3DObserver::Placement VtC3DObserver::FollowHeading(const osg::Matrixd& body) const
+{
+    const osg::Quat heading = HeadTurn(body.getRotate() * xAxis);
+    const osg::Matrixd placed = osg::Matrixd::translate(offsetTranslation) * osg::Matrixd::rotate(heading) *
+                                osg::Matrixd::translate(body.getTrans());
+    return {osg::Vec3f(placed.getTrans()), placed.getRotate()};
+}
+
+VtC3DObserver::Placement VtC3DObserver::LookAt(const osg::Matrixd& body) const
+{
+    const osg::Vec3f distance(body.getTrans() - osg::Vec3d(offsetTranslation));
+    return {offsetTranslation, HeadTurn(distance)};
+}
+
+void VtC3DObserver::Place(const Placement& placement)
+{
+    // Two quarter turns and a half one change from the axes of a body to those of a camera. The head turn of looking at
+    // a body takes the place of the offset about z.
+    const double z = followMode == followLookAt ? 0.0 : offsetAngles.z();
+    const osg::Matrixd axes = osg::Matrixd::rotate(base::RadiansFromDegrees(offsetAngles.x() + 90.0), zAxis,
+                                                   base::RadiansFromDegrees(offsetAngles.y() + 90.0), yAxis,
+                                                   base::RadiansFromDegrees(z + 180.0), zAxis);
+    const osg::Matrixd camera =
+        axes * osg::Matrixd::rotate(placement.rotation) * osg::Matrixd::translate(placement.position);
+    position = camera.getTrans();
+    setMatrix(osg::Matrixd::inverse(camera), true);
+}
+
+void VtC3DObserver::setPosition(const osg::Vec3f& eye, bool update)
+{
+    position = eye;
+    RebuildFreeView(update);
+}
+
+void VtC3DObserver::setRotation(const osg::Quat& newOrientation, bool update)
+{
+    orientation = newOrientation;
+    RebuildFreeView(update);
+}
+
+void VtC3DObserver::RebuildFreeView(bool update)
+{
+    const osg::Matrixd axes(1, 0, 0, 0, 0, 0, -1, 0, 0, 1, 0, 0, 0, 0, 0, 1);
+    const osg::Matrixd camera = axes * osg::Matrixd::rotate(orientation) * osg::Matrixd::rotate(quarterTurn, xAxis) *
+                                osg::Matrixd::translate(position);
+    setMatrix(osg::Matrixd::inverse(camera), update);
+}
+
+void VtC3DObserver::setMatrix(const osg::Matrixd& matrix, bool update)
+{
+    viewMatrix = matrix;
+    if (update)
+        PushViewMatrix();
+}
+
+void VtC3DObserver::StoreFreeView(const osg::Vec3f& eye, const osg::Quat& cameraRotation)
+{
+    WriteAttribute(L"position", Tupel(eye));
+    setPosition(eye, false);
+    WriteAttribute(L"orientation", RecordFromCameraRotation(cameraRotation));
+    setRotation(osg::Quat(quarterTurn, xAxis) * cameraRotation * osg::Quat(-quarterTurn, xAxis), false);
+    SetModified();
+}
+
+void VtC3DObserver::PushViewMatrix()
+{
+    for (osg::Camera* camera : cameras)
+        if (auto* view = dynamic_cast<osgViewer::View*>(camera->getView()))
+            if (osgGA::CameraManipulator* manipulator = view->getCameraManipulator())
+                manipulator->setByInverseMatrix(viewMatrix);
+}
+
+void VtC3DObserver::AddCamera(osg::Camera* camera)
+{
+    if (camera && !HasCamera(camera))
+        cameras.push_back(camera);
+}
+
+void VtC3DObserver::RemoveCamera(osg::Camera* camera)
+{
+    std::erase(cameras, camera);
+}
+
+bool VtC3DObserver::HasCamera(const osg::Camera* camera) const
+{
+    return camera && std::find(cameras.begin(), cameras.end(), camera) != cameras.end();
+}
+
+void VtC3DObserver::SetName(const std::wstring& name)
+{
+    SetDisplayName(name);
+    SetObjectName(name);
+    SetModified();
+}
+
+void VtC3DObserver::SetFollowMode(const std::wstring& name)
+{
+    followModeName = base::EqualsNoCase(name, fixedToBodyName) ? fixedToObjectName : name;
+    followMode = collection.GetFollowModeIndex(followModeName);
+    SetModified();
+}
+
+void VtC3DObserver::SetFollowModeIndex(std::int32_t index)
+{
+    followMode = index;
+    followModeName = collection.GetFollowModeName(index);
+    SetModified();
+}
+
+void VtC3DObserver::SetConnectedBody(VtC3DMovableBody* body)
+{
+    if (body)
+        body->AddRef();
+    if (connectedBody)
+        connectedBody->Release();
+    connectedBody = body;
+    connectedBodyName.clear();
+    SetModified();
+}
+
+void VtC3DObserver::Disconnect()
+{
+    SetConnectedBody(nullptr);
+    WriteAttribute(L"attached_to", notConnectedText);
+}
+
+void VtC3DObserver::SetTranslationOffset(const osg::Vec3f& offset)
+{
+    offsetTranslation = offset;
+    SetModified();
+    PushViewMatrix();
+}
+
+void VtC3DObserver::SetRotationOffset(const osg::Vec3f& angles)
+{
+    offsetAngles = angles;
+    offsetRotation = osg::Quat(base::RadiansFromDegrees(angles.z()), zAxis) *
+                     osg::Quat(base::RadiansFromDegrees(angles.y()), yAxis) *
+                     osg::Quat(base::RadiansFromDegrees(angles.x()), xAxis);
+    SetModified();
+    PushViewMatrix();
+}
+
+std::wstring VtC3DObserver::GetConnectedBodyName() const
+{
+    return connectedBody ? connectedBody->GetName() : connectedBodyName;
+}
+
+bool VtC3DObserver::IsValidConfiguration() const
+{
+    if (followMode < followFree || followMode >= followModeCount)
+        return false;
+    return NeedsBody() == (connectedBody != nullptr);
+}
+
+void VtC3DObserver::ApplyAttributes(VtISceneObject& source)
+{
+    if (!collection.IsFreeObserver(*this))
+        for (const wchar_t* name : {L"position", L"orientation"})
+            if (!source.GetAttribute(name))
+                source.AddAttribute(L"floatTupel3", L"0 0 0", name);
+    VtC3DBody::ApplyAttributes(source);
+}
+
+void VtC3DObserver::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                                       const VtTAttributeValue& value)
+{
+    const std::wstring name = base::ToLower(attributeName);
+    const auto* tupel = std::get_if<VtTFloatTupel3>(&value);
+    const auto* number = std::get_if<std::int32_t>(&value);
+    const auto* text = std::get_if<std::wstring>(&value);
+
+    if (name == L"behaviour" && number)
+    {
+        SetFollowModeIndex(*number);
+        isFree = *number == followFree;
+    }
+    else if (name == L"attached_to" && text)
+        OnAttachedTo(*text);
+    else if (name == L"translation" && tupel)
+        SetTranslationOffset(Vector(*tupel));
+    else if (name == L"rotation" && tupel)
+        SetRotationOffset(Vector(*tupel));
+    else if (name == L"position" && tupel)
+    {
+        setPosition(Vector(*tupel), true);
+        if (collection.GetInteraction().GetActiveObserver() == this)
+            collection.GetInteraction().SetHeadLightPosition(position);
+        SetModified();
+    }
+    else if (name == L"orientation" && tupel)
+    {
+        setRotation(RotationFromRecord(*tupel), true);
+        SetModified();
+    }
+    else if (name == L"name" && text)
+        SetName(*text);
+    else
+        VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
+}
+
+void VtC3DObserver::OnAttachedTo(const std::wstring& name)
+{
+    const VtCScene3D* scene = GetDocument().GetScene();
+    if (VtC3DMovableBody* body = scene ? scene->FindMovableByName(name) : nullptr)
+        SetConnectedBody(body);
+    else if (!connectedBody)
+        // Kept so that the user can be asked which body takes the place of the missing one.
+        connectedBodyName = base::EqualsNoCase(name, notConnectedText) ? std::wstring() : name;
+}
+
+void VtC3DObserver::ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key,
+                               float& number)
+{
+    std::wstring text;
+    if (reader.ReadText(section, key, text) == VtISettingsReader::found)
+        number = base::ParseFloat(base::Utf8(text)).value_or(number);
+}
+
+int VtC3DObserver::LoadSettings(const std::wstring& section, const VtISettingsReader& reader)
+{
+    std::wstring text;
+    if (const int status = reader.ReadText(section, L"Name", text); status != VtISettingsReader::found)
+        return status;
+    SetName(text);
+
+    ReadNumber(reader, section, L"OffsetRotationX", offsetAngles.x());
+    ReadNumber(reader, section, L"OffsetRotationY", offsetAngles.y());
+    ReadNumber(reader, section, L"OffsetRotationZ", offsetAngles.z());
+    ReadNumber(reader, section, L"OffsetTranslationX", offsetTranslation.x());
+    ReadNumber(reader, section, L"OffsetTranslationY", offsetTranslation.y());
+    ReadNumber(reader, section, L"OffsetTranslationZ", offsetTranslation.z());
+    if (reader.ReadText(section, L"FollowMode", text) == VtISettingsReader::found)
+        SetFollowMode(text);
+
+    text.clear();
+    const int status = reader.ReadText(section, L"ConnectedBody", text);
+    const VtCScene3D* scene = GetDocument().GetScene();
+    const bool bodiesKnown = status == VtISettingsReader::found && scene && scene->GetMovableBodies(0);
+    SetConnectedBody(bodiesKnown ? scene->FindMovableByName(text) : nullptr);
+    if (bodiesKnown && !connectedBody)
+        connectedBodyName = text;
+    SetRotationOffset(osg::Vec3f(offsetAngles));
+
+    WriteAttribute(L"name", GetName());
+    WriteAttribute(L"rotation", Tupel(offsetAngles));
+    WriteAttribute(L"translation", Tupel(offsetTranslation));
+    WriteAttribute(L"attached_to", GetConnectedBodyName());
+    WriteAttribute(L"behaviour", followMode);
+    return status;
+}
+
+int VtC3DObserver::SaveSettings(const std::wstring& section, VtISettingsWriter* writer) const
+{
+    if (!writer)
+        return -1;
+    const auto number = [](float value)
+    {
+        char text[64];
+        std::snprintf(text, sizeof(text), "%f", static_cast<double>(value));
+        return base::Wide(text);
+    };
+    const std::pair<const wchar_t*, std::wstring> keys[] = {
+        {L"Name", GetName()},
+        {L"OffsetRotationX", number(offsetAngles.x())},
+        {L"OffsetRotationY", number(offsetAngles.y())},
+        {L"OffsetRotationZ", number(offsetAngles.z())},
+        {L"OffsetTranslationX", number(offsetTranslation.x())},
+        {L"OffsetTranslationY", number(offsetTranslation.y())},
+        {L"OffsetTranslationZ", number(offsetTranslation.z())},
+        {L"FollowMode", followModeName},
+        {L"ConnectedBody", connectedBody ? connectedBody->GetName() : std::wstring()},
+    };
+    for (const auto& [key, value] : keys)
+        if (const int status = writer->WriteText(section, key, value); status != 0)
+            return status;
+    return 0;
+}

@@ -1,0 +1,153 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <osg/Camera>
+#include <osg/Matrixd>
+#include <osg/Quat>
+#include <osg/Vec3f>
+
+#include "interaction/FollowMode.h"
+#include "interaction/SmoothFollower.h"
+#include "scene/Body.h"
+
+class VtC3DMovableBody;
+class VtC3DObservers;
+class VtISettingsReader;
+class VtISettingsWriter;
+
+/// A place to look from: a position and a rotation of its own, or a rule that derives them from a moving body.
+///
+/// It turns them into one view matrix (scene to camera; the camera looks along its -z, y up) and hands that to the
+/// cameras of all views that look through it. With no offsets the camera looks along the followed body's x axis with the
+/// body's z up. Of the base it uses neither model nor node; `position` is the eye, in the scene, metres.
+class VtC3DObserver : public VtC3DBody
+{
+public:
+    /// Belongs to `parent`. A free observer has a record of its own kind (type 9) and its name as its id; any other gets
+    /// `id`, or a fresh one when that is empty.
+    VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection, const std::wstring& name,
+                  bool inTree, bool freeByBirth, const std::wstring& id);
+
+    /// The frame cycle's step: the placement for where the body is now, pushed to the cameras. Nothing while no view looks
+    /// through it.
+    void Update();
+
+    // Placement of a free observer.
+
+    /// Sets the eye; the free view is rebuilt, and pushed to the cameras with `update`.
+    void setPosition(const osg::Vec3f& eye, bool update);
+
+    /// Sets the rotation. Identity looks along the scene's y axis with z up.
+    void setRotation(const osg::Quat& newOrientation, bool update);
+    const osg::Quat& GetOrientation() const { return orientation; }
+
+    void setMatrix(const osg::Matrixd& matrix, bool update);
+    const osg::Matrixd& GetViewMatrix() const { return viewMatrix; }
+
+    /// Takes over where the mouse left the camera (`cameraRotation`: camera axes to scene), and writes it to the record,
+    /// in the form that reads back as the same view.
+    void StoreFreeView(const osg::Vec3f& eye, const osg::Quat& cameraRotation);
+
+    // The cameras of the views that look through it; not owned.
+
+    void PushViewMatrix();
+    void AddCamera(osg::Camera* camera);
+    void RemoveCamera(osg::Camera* camera);
+    bool HasCamera(const osg::Camera* camera) const;
+    const std::vector<osg::Camera*>& GetCameras() const { return cameras; }
+
+    /// True while a view looks through it; the views tell it.
+    void SetAssigned(bool flag) { assigned = flag; }
+    bool IsAssigned() const { return assigned; }
+
+    // What the user sets. Each marks the document as changed.
+
+    void SetName(const std::wstring& name);
+
+    /// By name, of the parent's list; "Fixed_to_Body" is an older name of a mode. An unknown name gives mode 0.
+    void SetFollowMode(const std::wstring& name);
+    void SetFollowModeIndex(std::int32_t index);
+
+    /// The followed body, null for none. It lives on as long as it is followed, even when the scene has let it go.
+    void SetConnectedBody(VtC3DMovableBody* body);
+
+    /// The body goes: no target from then on, and the record says so.
+    void Disconnect();
+
+    void SetTranslationOffset(const osg::Vec3f& offset);
+
+    /// About x, y, z in degrees, against the followed rotation.
+    void SetRotationOffset(const osg::Vec3f& angles);
+
+    const osg::Vec3f& GetTranslationOffset() const { return offsetTranslation; }
+    const osg::Vec3f& GetRotationOffset() const { return offsetAngles; }
+    const osg::Quat& GetOffsetRotation() const { return offsetRotation; }
+    std::int32_t GetFollowMode() const { return followMode; }
+    const std::wstring& GetFollowModeName() const { return followModeName; }
+    VtC3DMovableBody* GetConnectedBody() const { return connectedBody; }
+
+    /// The name of the followed body, or of the one that is stored and that the scene doesn't hold.
+    std::wstring GetConnectedBodyName() const;
+
+    /// The mouse drives it.
+    bool IsFree() const { return isFree; }
+    void SetFree(bool flag) { isFree = flag; }
+
+    bool NeedsBody() const { return FollowModeNeedsBody(followMode); }
+
+    /// A body is there just if the mode needs one.
+    bool IsValidConfiguration() const;
+
+    /// Forgets the followed rotations of an earlier run.
+    void ClearFollower() { follower.Clear(); }
+
+    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
+    void FinishLoad(const std::wstring& id) { RebindAttributes(id); }
+
+    void ApplyAttributes(VtISceneObject& source) override;
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+
+    /// Reads the keys of a section; the status of the last of them. Nothing changes when there is no "Name".
+    int LoadSettings(const std::wstring& section, const VtISettingsReader& reader);
+    int SaveSettings(const std::wstring& section, VtISettingsWriter* writer) const;
+
+protected:
+    ~VtC3DObserver() override;
+
+private:
+    struct Placement
+    {
+        osg::Vec3f position;
+        osg::Quat rotation;
+    };
+
+    void MakeRecord(bool freeByBirth);
+    void ReadFirstPlacement();
+    Placement FollowRigid(const osg::Matrixd& body) const;
+    Placement FollowHeading(const osg::Matrixd& body) const;
+    Placement LookAt(const osg::Matrixd& body) const;
+    void Place(const Placement& placement);
+    void RebuildFreeView(bool update);
+    void OnAttachedTo(const std::wstring& name);
+    void ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key, float& number);
+
+    VtC3DObservers& collection;
+    bool assigned = false;
+    bool isFree = false;
+    osg::Vec3f offsetAngles; ///< degrees about x, y, z
+    osg::Vec3f offsetTranslation{0, 0, 1.5f};
+    osg::Quat offsetRotation;
+    osg::Quat orientation;
+    osg::Matrixd viewMatrix;
+    std::vector<osg::Camera*> cameras;
+    std::int32_t followMode = followFixed;
+    std::wstring followModeName;
+    VtC3DMovableBody* connectedBody = nullptr; ///< one reference
+    std::wstring connectedBodyName; ///< of a body that the scene doesn't hold
+    VtCSmoothFollower follower;
+};
