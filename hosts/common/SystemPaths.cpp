@@ -1,0 +1,93 @@
+#include "hosts/common/SystemPaths.h"
+
+#include <cstdlib>
+#include <initializer_list>
+
+#include "base/Paths.h"
+#include "base/Text.h"
+#include "hosts/common/IniFile.h"
+
+namespace hosts
+{
+
+namespace
+{
+
+constexpr const wchar_t* presentSubfolder = L"\\advanced";
+
+std::string Environment(const char* name)
+{
+    const char* value = std::getenv(name);
+    return value ? value : "";
+}
+
+std::wstring WithoutTrailingSeparators(std::wstring path)
+{
+    while (path.size() > 1 && path.back() == L'\\')
+        path.pop_back();
+    return path;
+}
+
+std::wstring LibraryRoot(const char* variable, const IniFile& configuration, const char* key,
+                         const std::filesystem::path& fallback)
+{
+    std::filesystem::path root = Environment(variable);
+    if (root.empty())
+        root = configuration.Find("Libraries", key).value_or("");
+    if (root.empty())
+        root = fallback;
+    return WithoutTrailingSeparators(base::InnerPath(std::filesystem::absolute(root).lexically_normal()));
+}
+
+} // namespace
+
+std::filesystem::path ModuleFolder()
+{
+    std::error_code failed;
+    const std::filesystem::path program = std::filesystem::read_symlink("/proc/self/exe", failed);
+    return failed ? std::filesystem::path() : program.parent_path();
+}
+
+std::filesystem::path FindDataFolder(const std::filesystem::path& module)
+{
+    if (const std::filesystem::path given = Environment("PANORAMIC_DATA"); !given.empty())
+        return given;
+    for (const char* place : {"../share/panoramic", "../../../share/panoramic"})
+    {
+        std::error_code failed;
+        const std::filesystem::path folder = (module / place).lexically_normal();
+        if (std::filesystem::is_directory(folder / "texts", failed))
+            return folder;
+    }
+    return {};
+}
+
+std::filesystem::path ConfigurationFolder()
+{
+    // A relative $XDG_CONFIG_HOME is invalid by its own standard and to be ignored.
+    if (const std::filesystem::path given = Environment("XDG_CONFIG_HOME"); given.is_absolute())
+        return given / "panoramic";
+    if (const std::filesystem::path home = Environment("HOME"); home.is_absolute())
+        return home / ".config" / "panoramic";
+    return {};
+}
+
+SystemPaths::SystemPaths(const IniFile& configuration, const std::filesystem::path& data,
+                         const std::filesystem::path& moduleFolder)
+    : objects(
+          LibraryRoot("PANORAMIC_OBJECTS", configuration, "Objects", data / "example" / "objects" / "advanced")),
+      customer(LibraryRoot("PANORAMIC_CUSTOMER_OBJECTS", configuration, "CustomerObjects",
+                           data / "example" / "customer"))
+{
+    if (!base::ToLower(objects).ends_with(presentSubfolder))
+        objects += presentSubfolder;
+    if (!moduleFolder.empty())
+        module = base::InnerPath(moduleFolder) + L"\\";
+}
+
+std::wstring SystemPaths::GetObjectsSubfolder() const
+{
+    return presentSubfolder;
+}
+
+} // namespace hosts

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+
+#include "host/LibraryPaths.h"
+
+namespace hosts
+{
+
+class IniFile;
+
+/// Folder of the running program, links resolved; empty when it can't be told.
+std::filesystem::path ModuleFolder();
+
+/// Folder of texts and example: $PANORAMIC_DATA, else the share/panoramic that belongs to a program in `module`,
+/// in a build tree or where it is installed. Empty when there is none.
+std::filesystem::path FindDataFolder(const std::filesystem::path& module);
+
+/// The user's own folder of settings, $XDG_CONFIG_HOME/panoramic or ~/.config/panoramic. It need not exist. Empty
+/// when the user has no home.
+std::filesystem::path ConfigurationFolder();
+
+/// Where the object libraries and the program lie.
+///
+/// A library's root is, in this order: $PANORAMIC_OBJECTS and $PANORAMIC_CUSTOMER_OBJECTS, the entries "Objects" and
+/// "CustomerObjects" of the section [Libraries] of the configuration, the library of the example in `data`.
+/// The product's root ends in its present subfolder, "advanced"; it is appended to a root without it.
+class SystemPaths : public host::LibraryPaths
+{
+public:
+    SystemPaths(const IniFile& configuration, const std::filesystem::path& data, const std::filesystem::path& module);
+
+    std::wstring GetObjectsPath() const override { return objects; }
+    std::wstring GetObjectsSubfolder() const override;
+    std::wstring GetCustomerPath() const override { return customer; }
+    std::wstring GetModuleDirectory() const override { return module; }
+
+private:
+    std::wstring objects;
+    std::wstring customer;
+    std::wstring module;
+};
+
+} // namespace hosts

@@ -1,0 +1,117 @@
+#pragma once
+
+#include <filesystem>
+#include <map>
+#include <memory>
+#include <string>
+
+#include "host/Frame.h"
+#include "host/Host.h"
+#include "host/Questions.h"
+#include "hosts/common/DocumentList.h"
+#include "hosts/common/EglGraphics.h"
+#include "hosts/common/FileConfiguration.h"
+#include "hosts/common/FileSettings.h"
+#include "hosts/common/IdleLoop.h"
+#include "hosts/common/IniFile.h"
+#include "hosts/common/IniTexts.h"
+#include "hosts/common/SystemClock.h"
+#include "hosts/common/SystemPaths.h"
+#include "hosts/console/ConsoleMessages.h"
+#include "hosts/console/Terminal.h"
+#include "hosts/console/TerminalProgress.h"
+
+namespace console
+{
+
+/// A main window that is always there: a console program has nothing to minimise, but nothing moves without one.
+class ConsoleWindow : public host::MainWindow
+{
+public:
+    std::int32_t GetWindowState() const override { return state; }
+    void SetWindowState(std::int32_t newState) override { state = newState; }
+
+private:
+    std::int32_t state = host::windowNormal;
+};
+
+/// Keeps what the component publishes, for the command to read.
+class ConsoleVariables : public host::Variables
+{
+public:
+    explicit ConsoleVariables(host::IdleSource& source) : idleSource(source) {}
+
+    void SetText(const std::wstring& name, const std::wstring& value) override { texts[name] = value; }
+    void SetBool(const std::wstring& name, bool value) override { switches[name] = value; }
+    host::IdleSource* GetIdleSource() override { return &idleSource; }
+
+    /// Empty for a variable that was never set.
+    std::wstring GetText(const std::wstring& name) const;
+
+private:
+    host::IdleSource& idleSource;
+    std::map<std::wstring, std::wstring> texts;
+    std::map<std::wstring, bool> switches;
+};
+
+/// Nobody is there to ask, so every question stays without an answer.
+class ConsoleQuestions : public host::Questions
+{
+public:
+    std::optional<std::wstring> AskSaveFile(const host::FileQuestion&) override { return std::nullopt; }
+    std::optional<std::wstring> AskOpenFile(const host::FileQuestion&) override { return std::nullopt; }
+};
+
+/// The program around the component on a console: messages and progress on standard error, settings under the XDG
+/// folder, pictures off-screen. It has no menus, tool bars or panes, so there is no user interface service.
+class ConsoleHost : public host::Host
+{
+public:
+    /// `showLog`: log messages are shown too.
+    explicit ConsoleHost(bool showLog);
+    ~ConsoleHost() override;
+
+    host::Clock& GetClock() override { return clock; }
+    host::Texts& GetTexts() override { return texts; }
+    host::LibraryPaths& GetLibraryPaths() override { return paths; }
+    host::MainWindow* GetMainWindow() override { return &window; }
+    host::Variables* GetVariables() override { return &variables; }
+    host::UserInterface* GetUserInterface() override { return nullptr; }
+    host::DocumentManager* GetDocumentManager() override { return &documents; }
+    host::MessageService* GetMessageService() override { return &messages; }
+    host::Progress* GetProgress() override { return &progress; }
+    host::Configuration* GetConfiguration() override { return &configuration; }
+    host::Settings* GetSettings() override { return &settings; }
+    host::Questions* GetQuestions() override { return &questions; }
+    host::Graphics* GetGraphics() override { return &graphics; }
+
+    hosts::IdleLoop& GetIdleLoop() { return loop; }
+    ConsoleMessages& GetMessages() { return messages; }
+    Terminal& GetTerminal() { return terminal; }
+    const ConsoleVariables& GetPublished() const { return variables; }
+
+    /// Messages of the command itself, by their number in the texts; paths come in their own form.
+    void ShowError(std::uint32_t number, const std::string& first = {}, const std::string& second = {});
+    void ShowInformation(std::uint32_t number, const std::string& first = {}, const std::string& second = {});
+
+private:
+    hosts::SystemClock clock;
+    Terminal terminal;
+    std::filesystem::path module;
+    std::filesystem::path data;
+    hosts::IniTexts texts;
+    ConsoleMessages messages;
+    TerminalProgress progress;
+    hosts::IniFile configurationFile;
+    hosts::FileConfiguration configuration;
+    hosts::FileSettings settings;
+    hosts::SystemPaths paths;
+    hosts::IdleLoop loop;
+    ConsoleWindow window;
+    ConsoleVariables variables;
+    ConsoleQuestions questions;
+    hosts::EglGraphics graphics;
+    hosts::DocumentList documents;
+};
+
+} // namespace console

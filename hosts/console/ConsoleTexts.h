@@ -1,0 +1,24 @@
+#pragma once
+
+#include <cstdint>
+
+/// Messages of the command itself, by their number in the texts.
+namespace console
+{
+
+inline constexpr std::uint32_t messageNoFilePoint = 9110;
+inline constexpr std::uint32_t messageDataUnusable = 9111;      ///< %1 the file
+inline constexpr std::uint32_t messageNoChannel = 9112;         ///< %1 the body, %2 the channel
+inline constexpr std::uint32_t messageChannelsAre = 9113;       ///< %1 their names
+inline constexpr std::uint32_t messageTimeOutside = 9114;       ///< %1 the time, %2 the span
+inline constexpr std::uint32_t messageNoSuchFrame = 9115;       ///< %1 the frame, %2 the range
+inline constexpr std::uint32_t messageNoTimeStamps = 9116;      ///< %1 the file
+inline constexpr std::uint32_t messagePictureNotWritten = 9120; ///< %1 file and reason
+inline constexpr std::uint32_t messagePictureNotRead = 9121;
+inline constexpr std::uint32_t messageFolderNotMade = 9122; ///< %1 folder and reason
+inline constexpr std::uint32_t messageConversion = 9123;    ///< %1 file, place and reason
+inline constexpr std::uint32_t messageAlwaysHeadless = 9124;
+inline constexpr std::uint32_t messageInterrupted = 9125;
+inline constexpr std::uint32_t textPlaying = 9130;
+
+} // namespace console

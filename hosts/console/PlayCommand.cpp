@@ -1,0 +1,138 @@
+#include <CLI/CLI.hpp>
+
+#include <csignal>
+#include <iostream>
+#include <memory>
+
+#include "app/PanoramicDocument.h"
+#include "base/Numbers.h"
+#include "hosts/console/Command.h"
+#include "hosts/console/ConsoleTexts.h"
+#include "hosts/console/Playback.h"
+#include "hosts/console/Session.h"
+
+namespace console
+{
+
+namespace
+{
+
+struct Play
+{
+    ViewArguments view;
+    PlaybackArguments playback;
+    std::string speedText = "1";
+    bool headless = false;
+};
+
+volatile std::sig_atomic_t interrupted = 0;
+
+extern "C" void OnInterrupt(int)
+{
+    interrupted = 1;
+}
+
+void WatchForInterrupt()
+{
+    struct sigaction action = {};
+    action.sa_handler = OnInterrupt;
+    action.sa_flags = SA_RESETHAND; // a second one ends the program the hard way
+    sigaction(SIGINT, &action, nullptr);
+    sigaction(SIGTERM, &action, nullptr);
+}
+
+int Run(const Play& play)
+{
+    WatchForInterrupt();
+    Session session(play.view.verbose);
+    if (!play.headless)
+        session.GetHost().ShowInformation(messageAlwaysHeadless);
+    VtCPanoramicDocument* document = session.NewDocument();
+    if (!document)
+        return session.GetExitStatus();
+    const std::unique_ptr<ConsoleView> view =
+        ConsoleView::Create(session.GetHost(), *document->GetScene(), play.view.size);
+    if (!view)
+        return session.GetExitStatus();
+
+    BuildBodies(session, *document, play.view.scene);
+    if (!LoadData(session, play.view.scene.data) || !BindChannels(session, *document, play.view.scene.movables))
+        return session.GetExitStatus();
+
+    Playback playback(session, *view, play.view, play.playback);
+    if (playback.Prepare())
+        playback.Run(interrupted);
+    return session.GetExitStatus();
+}
+
+void Check(Play& play)
+{
+    const auto speed = base::ParseDouble(play.speedText);
+    if (!speed || *speed <= 0.0)
+        RejectArguments("--speed: \"" + play.speedText + "\" is not a positive number");
+    play.playback.speed = *speed;
+    if (!play.playback.shotsFile.empty())
+        play.playback.shots = ReadShots(play.playback.shotsFile);
+    if (!play.playback.shots.empty() && play.view.eye == play.view.look)
+    {
+        play.view.eye = play.playback.shots.front().eye;
+        play.view.look = play.playback.shots.front().look;
+    }
+    CheckViewArguments(play.view);
+}
+
+} // namespace
+
+void AddPlayCommand(CLI::App& program, int& status)
+{
+    auto play = std::make_shared<Play>();
+    CLI::App* command = program.add_subcommand("play", "Replay a run in real time; tell how many frames a second.");
+    const ViewOptions options = AddViewOptions(*command, play->view);
+    options.data->required();
+    options.eye->needs(options.look);
+    options.look->needs(options.eye);
+    command->add_option("--speed", play->speedText, "Seconds of the data in a second.")->type_name("F");
+    command->add_option("--loop", play->playback.passes, "How many times the run is played. [1]")
+        ->type_name("N")
+        ->check(CLI::PositiveNumber);
+    command->add_flag("--headless", play->headless,
+                      "Draw off-screen. A console has no window, so this is what happens in any case.");
+    CLI::Option* pictures = command
+                                ->add_option("--pictures", play->playback.folder,
+                                             "Write pictures of the run to this folder, and contact-sheet.png.")
+                                ->type_name("FOLDER");
+    CLI::Option* shots = command
+                             ->add_option("--shots", play->playback.shotsFile,
+                                          "When pictures are taken: a file of lines \"time ex,ey,ez lx,ly,lz name\".")
+                             ->type_name("FILE")
+                             ->needs(pictures);
+    command
+        ->add_option("--count", play->playback.count,
+                     "How many pictures are taken, at equal distances in time, when there are no shots. [6]")
+        ->type_name("N")
+        ->check(CLI::Range(1, 200))
+        ->needs(pictures)
+        ->excludes(shots);
+    command->footer("Examples:\n"
+                    "  panoramic play --static road.dae --movable Car=car.dae:Chassis --data run.mdf \\\n"
+                    "      --eye -8,-12,4 --look 0,0,1 --headless\n"
+                    "  panoramic play @scene.args --shots shots.txt --pictures out --headless\n"
+                    "Ctrl-C ends it cleanly.");
+    command->callback(
+        [play, options, shots, &status]
+        {
+            if (options.eye->count() == 0 && shots->count() == 0)
+                RejectArguments("--eye and --look are required without --shots");
+            try
+            {
+                Check(*play);
+            }
+            catch (const ArgumentError& error)
+            {
+                RejectArguments(error.what());
+            }
+            status = Run(*play);
+        });
+}
+
+} // namespace console

@@ -1,0 +1,183 @@
+#include "hosts/console/Playback.h"
+
+#include <algorithm>
+#include <iostream>
+
+#include <fmt/format.h>
+#include <fmt/xchar.h>
+
+#include "base/Text.h"
+#include "hosts/common/Picture.h"
+#include "hosts/console/ConsoleTexts.h"
+#include "hosts/console/Session.h"
+#include "simdata/SimulationDataController.h"
+
+namespace console
+{
+
+namespace
+{
+
+constexpr long activity = 9000;
+constexpr std::uint32_t progressInterval = 100; // milliseconds
+constexpr long progressSteps = 100;
+constexpr int sheetColumns = 3;
+constexpr int sheetCell = 480; // pixels
+
+} // namespace
+
+Playback::Playback(Session& runningSession, ConsoleView& consoleView, const ViewArguments& viewed,
+                   const PlaybackArguments& given)
+    : session(runningSession), view(consoleView), viewArguments(viewed), arguments(given)
+{
+}
+
+bool Playback::Prepare()
+{
+    if (arguments.folder.empty())
+        return true;
+    const std::optional<TimeSpan> span = GetTimeSpan(session);
+    if (span && arguments.shots.empty())
+        arguments.shots =
+            EquallySpacedShots(span->first, span->last, arguments.count, viewArguments.eye, viewArguments.look);
+    // Without time stamps there is one shot's worth of message, and no shot.
+    if (!span)
+        return CheckTime(session, 0.0, viewArguments.scene.data);
+    for (const Shot& shot : arguments.shots)
+        if (!CheckTime(session, shot.time, viewArguments.scene.data))
+            return false;
+
+    std::error_code failed;
+    std::filesystem::create_directories(arguments.folder, failed);
+    if (!failed)
+        return true;
+    session.GetHost().ShowError(messageFolderNotMade, arguments.folder.string() + ": " + failed.message());
+    return false;
+}
+
+void Playback::Run(const volatile std::sig_atomic_t& interrupted)
+{
+    view.LookAt(viewArguments.eye, viewArguments.look);
+    session.GetController().SetSpeed(arguments.speed);
+    host::Clock& clock = session.GetHost().GetClock();
+    host::Progress& progress = *session.GetHost().GetProgress();
+
+    progress.ConnectProgressActivity(activity, session.GetHost().GetTexts().GetText(textPlaying), {});
+    const std::int64_t start = clock.Counter();
+    for (int pass = 1; pass <= arguments.passes; ++pass)
+        if (!PlayPass(pass, interrupted))
+            break;
+    const double seconds = static_cast<double>(clock.Counter() - start) / static_cast<double>(clock.CounterFrequency());
+    session.GetController().StopPlay();
+    progress.DisconnectProgressActivity(activity);
+
+    if (interrupted)
+        session.GetHost().ShowInformation(messageInterrupted);
+    WriteContactSheet();
+    PrintResult(seconds);
+}
+
+bool Playback::PlayPass(int pass, const volatile std::sig_atomic_t& interrupted)
+{
+    VtCSimulationDataController& controller = session.GetController();
+    session.GetHost().GetProgress()->SetProgresStepCount(activity, GetTimeSpan(session) ? progressSteps : 0);
+    shownSteps = 0;
+    if (!controller.GotoFirst())
+        return false;
+    const double first = CurrentTime();
+    controller.PlayOnce();
+    const bool ended = session.GetHost().GetIdleLoop().Run(
+        [&]
+        {
+            TakeDueShots();
+            ShowProgress(pass);
+            const bool goesOn = controller.HasPlayState() && !interrupted;
+            frames += goesOn;
+            return goesOn;
+        });
+    played += CurrentTime() - first;
+    return ended && !interrupted;
+}
+
+double Playback::CurrentTime() const
+{
+    return session.GetController().GetRouter().GetTimestampOfCurrent().value_or(0.0);
+}
+
+void Playback::TakeDueShots()
+{
+    if (nextShot >= arguments.shots.size())
+        return;
+    const double now = CurrentTime();
+    while (nextShot < arguments.shots.size() && arguments.shots[nextShot].time <= now)
+        Take(arguments.shots[nextShot++]);
+}
+
+void Playback::Take(const Shot& shot)
+{
+    view.LookAt(shot.eye, shot.look);
+    session.GetApp().RedrawNow();
+    const osg::ref_ptr<osg::Image> picture = view.Read();
+    view.LookAt(viewArguments.eye, viewArguments.look);
+    if (!picture)
+    {
+        session.GetHost().ShowError(messagePictureNotRead);
+        return;
+    }
+    const std::filesystem::path file = arguments.folder / (shot.name + ".png");
+    if (const std::string reason = hosts::WritePicture(*picture, file); !reason.empty())
+    {
+        session.GetHost().ShowError(messagePictureNotWritten, reason);
+        return;
+    }
+    pictures.push_back(picture);
+    made.push_back(file);
+}
+
+void Playback::ShowProgress(int pass)
+{
+    const std::uint32_t now = session.GetHost().GetClock().TickCount();
+    if (now - lastProgress < progressInterval)
+        return;
+    lastProgress = now;
+    const std::optional<TimeSpan> span = GetTimeSpan(session);
+    std::wstring text = arguments.passes > 1 ? fmt::format(L"pass {} of {}, ", pass, arguments.passes) : L"";
+    const std::wstring fps = session.GetHost().GetPublished().GetText(L"fps");
+    host::Progress& progress = *session.GetHost().GetProgress();
+    if (span && span->last > span->first)
+    {
+        const double time = CurrentTime();
+        const auto steps = static_cast<long>((time - span->first) / (span->last - span->first) * progressSteps);
+        for (; shownSteps < std::min(steps, progressSteps); ++shownSteps)
+            progress.StepProgressActivity(activity);
+        text += fmt::format(L"{:.1f} s of {:.1f} s", time - span->first, span->last - span->first);
+    }
+    else
+        text += fmt::format(L"frame {}", session.GetController().GetRouter().GetRecent({}));
+    progress.SetProgressDescription(activity, fps.empty() ? text : text + L", " + fps + L" fps");
+}
+
+void Playback::WriteContactSheet()
+{
+    if (pictures.empty())
+        return;
+    const int columns = std::min<int>(sheetColumns, static_cast<int>(pictures.size()));
+    const osg::ref_ptr<osg::Image> sheet = hosts::ComposeContactSheet(pictures, columns, sheetCell);
+    if (!sheet)
+        return;
+    const std::filesystem::path file = arguments.folder / "contact-sheet.png";
+    if (const std::string reason = hosts::WritePicture(*sheet, file); !reason.empty())
+        session.GetHost().ShowError(messagePictureNotWritten, reason);
+    else
+        made.push_back(file);
+}
+
+void Playback::PrintResult(double seconds) const
+{
+    std::cout << fmt::format("{} frames in {:.2f} s: {:.1f} fps; {:.2f} s of data\n", frames, seconds,
+                             seconds > 0.0 ? static_cast<double>(frames) / seconds : 0.0, played);
+    for (const std::filesystem::path& file : made)
+        std::cout << file.string() << '\n';
+}
+
+} // namespace console

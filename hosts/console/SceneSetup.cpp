@@ -1,0 +1,212 @@
+#include "hosts/console/SceneSetup.h"
+
+#include <algorithm>
+
+#include <fmt/format.h>
+
+#include "app/PanoramicDocument.h"
+#include "base/Numbers.h"
+#include "base/Paths.h"
+#include "base/Text.h"
+#include "hosts/console/ConsoleTexts.h"
+#include "hosts/console/Session.h"
+#include "render/AssetManager.h"
+#include "scene/MovableBody.h"
+#include "scene/Scene3D.h"
+#include "scene/StaticBody.h"
+#include "simdata/SimulationDataController.h"
+
+namespace console
+{
+
+namespace
+{
+
+constexpr std::uint32_t textLoadingScene = 7002;
+constexpr std::uint32_t textLoadingData = 7004;
+
+// Numbers of the progress activities.
+constexpr long loadingScene = 51;
+constexpr long loadingData = 41;
+
+const std::wstring filePoint = L"File";
+
+std::filesystem::path Complete(const std::filesystem::path& file)
+{
+    return std::filesystem::absolute(file).lexically_normal();
+}
+
+VtTFloatTupel3 Floats(const Triple& numbers)
+{
+    return {static_cast<float>(numbers[0]), static_cast<float>(numbers[1]), static_cast<float>(numbers[2])};
+}
+
+void BuildStatic(VtCPanoramicDocument& document, const StaticArgument& argument)
+{
+    const std::filesystem::path model = Complete(argument.model);
+    const std::wstring name = base::Wide(model.stem().string());
+    // The collection takes the one reference of a new body.
+    auto* body = new VtC3DStaticBody(document, *document.GetScene()->GetStaticBodies(), name, base::InnerPath(model),
+                                     osg::Matrixd(), true, {});
+    if (const osg::ref_ptr<VtISceneObject> record = body->GetAttributeObject())
+    {
+        record->Write(L"position", Floats(argument.position));
+        record->Write(L"rotation", Floats(argument.rotation));
+    }
+    body->AssignShaders();
+}
+
+void BuildMovable(VtCPanoramicDocument& document, const MovableArgument& argument)
+{
+    const std::filesystem::path model = Complete(argument.model);
+    const std::wstring name = base::Wide(argument.name);
+    new VtC3DMovableBody(document, *document.GetScene()->GetMovableBodies(0), name, base::InnerPath(model),
+                         osg::Matrixd(), true, nullptr, {});
+}
+
+// Reading models is the long part, and several can be read at a time.
+void PreloadModels(const SceneArguments& scene)
+{
+    std::vector<std::wstring> statics, movables;
+    for (const StaticArgument& argument : scene.statics)
+        statics.push_back(base::InnerPath(Complete(argument.model)));
+    for (const MovableArgument& argument : scene.movables)
+        movables.push_back(base::InnerPath(Complete(argument.model)));
+    VtCOsgAssetManager::getInstance().preloadModels(statics, false);
+    VtCOsgAssetManager::getInstance().preloadModels(movables, true);
+}
+
+std::string SpanText(const TimeSpan& span)
+{
+    return fmt::format("from {} s to {} s", base::FormatDouble(span.first), base::FormatDouble(span.last));
+}
+
+std::string Joined(const std::vector<std::wstring>& names)
+{
+    std::string text;
+    for (const std::wstring& name : names)
+        text += (text.empty() ? "" : ", ") + base::Utf8(name);
+    return text;
+}
+
+} // namespace
+
+void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneArguments& scene)
+{
+    host::Progress& progress = *session.GetHost().GetProgress();
+    progress.ConnectProgressActivity(loadingScene, session.GetHost().GetTexts().GetText(textLoadingScene), {});
+    PreloadModels(scene);
+    progress.SetProgresStepCount(loadingScene, static_cast<long>(scene.statics.size() + scene.movables.size()));
+    for (const StaticArgument& argument : scene.statics)
+    {
+        progress.SetProgressDescription(loadingScene, base::Wide(argument.model.filename().string()));
+        BuildStatic(document, argument);
+        progress.StepProgressActivity(loadingScene);
+    }
+    for (const MovableArgument& argument : scene.movables)
+    {
+        progress.SetProgressDescription(loadingScene, base::Wide(argument.name));
+        BuildMovable(document, argument);
+        progress.StepProgressActivity(loadingScene);
+    }
+    progress.DisconnectProgressActivity(loadingScene);
+}
+
+bool LoadData(Session& session, const std::filesystem::path& file)
+{
+    ConsoleHost& host = session.GetHost();
+    VtCSimulationDataRouter& router = session.GetController().GetRouter();
+    SimulationDataPoints::VtCSimulationDataPoint* point = router.FindPoint(filePoint);
+    if (!point)
+    {
+        host.ShowError(messageNoFilePoint);
+        return false;
+    }
+    host::Progress& progress = *host.GetProgress();
+    progress.ConnectProgressActivity(loadingData, host.GetTexts().GetText(textLoadingData),
+                                     base::Wide(file.filename().string()));
+    point->SetProgressBarActivityID(loadingData);
+    const bool configured = point->Configure(L"MDF", base::InnerPath(Complete(file)), 1, 0) != 0;
+    progress.DisconnectProgressActivity(loadingData);
+
+    if (configured)
+        session.GetController().ChoosePoint(filePoint);
+    if (SimulationDataPoints::VtCMessageStack* stack = point->GetMessageStack())
+    {
+        session.GetApp().GetMessageHandler().ReportStack(*stack);
+        point->ResetMessageStack();
+    }
+    if (!configured && session.GetExitStatus() == 0)
+        host.ShowError(messageDataUnusable, file.string());
+    return configured;
+}
+
+bool BindChannels(Session& session, VtCPanoramicDocument& document, const std::vector<MovableArgument>& movables)
+{
+    const VtTChannelLists& channels = session.GetController().GetRouter().GetActiveChannels();
+    const std::vector<VtC3DMovableBody*>& bodies = document.GetScene()->GetMovableBodies(0)->GetBodies();
+    bool complete = true;
+    for (std::size_t i = 0; i < movables.size() && i < bodies.size(); ++i)
+    {
+        const std::wstring wanted = base::Wide(movables[i].channel);
+        const auto found = std::find_if(channels.poses.begin(), channels.poses.end(),
+                                        [&](const std::wstring& name) { return base::EqualsNoCase(name, wanted); });
+        if (found == channels.poses.end())
+        {
+            session.GetHost().ShowError(messageNoChannel, movables[i].name, movables[i].channel);
+            complete = false;
+            continue;
+        }
+        const auto index = static_cast<std::int32_t>(found - channels.poses.begin());
+        // The crosswise name is right: this attribute holds the index.
+        if (const osg::ref_ptr<VtISceneObject> record = bodies[i]->GetAttributeObject())
+            record->Write(L"simulation_data_stream", index);
+    }
+    if (!complete)
+        session.GetHost().ShowInformation(messageChannelsAre, Joined(channels.poses));
+    return complete;
+}
+
+std::optional<TimeSpan> GetTimeSpan(Session& session)
+{
+    const SimulationDataPoints::VtCSimulationDataPoint* point = session.GetController().GetRouter().GetActivePoint(0);
+    TimeSpan span;
+    if (!point || !point->GetFrameBufferEarliestTime(span.first) || !point->GetFrameBufferLatestTime(span.last))
+        return std::nullopt;
+    return span;
+}
+
+bool CheckTime(Session& session, double time, const std::filesystem::path& file)
+{
+    const std::optional<TimeSpan> span = GetTimeSpan(session);
+    if (!span)
+    {
+        session.GetHost().ShowError(messageNoTimeStamps, file.string());
+        return false;
+    }
+    if (time >= span->first && time <= span->last)
+        return true;
+    session.GetHost().ShowError(messageTimeOutside, base::FormatDouble(time) + " s", SpanText(*span));
+    return false;
+}
+
+bool GoToTime(Session& session, double time, const std::filesystem::path& file)
+{
+    if (!CheckTime(session, time, file))
+        return false;
+    SimulationDataPoints::VtCSimulationDataFrame* frame =
+        session.GetController().GetRouter().GetActivePoint(0)->GetAtTime(time);
+    return frame && GoToFrame(session, frame->GetFrameId());
+}
+
+bool GoToFrame(Session& session, long number)
+{
+    VtCSimulationDataController& controller = session.GetController();
+    const unsigned long count = controller.GetRouter().GetBufferedFrames({});
+    if (number >= 1 && static_cast<unsigned long>(number) <= count && controller.ShowFrame({}, number))
+        return true;
+    session.GetHost().ShowError(messageNoSuchFrame, std::to_string(number), fmt::format("from 1 to {}", count));
+    return false;
+}
+
+} // namespace console

@@ -1,0 +1,39 @@
+#pragma once
+
+#include "app/PanoramicApp.h"
+#include "hosts/console/ConsoleHost.h"
+
+class VtCPanoramicDocument;
+class VtCSimulationDataController;
+
+namespace console
+{
+
+/// The component from its first stage to its last, on a console.
+class Session
+{
+public:
+    /// Runs the stages of the start; the frame cycle is live behind it.
+    explicit Session(bool showLog);
+
+    /// Stops what runs, closes the documents and runs the stages of the end.
+    ~Session();
+    Session(const Session&) = delete;
+    Session& operator=(const Session&) = delete;
+
+    ConsoleHost& GetHost() { return host; }
+    VtCPanoramicApp& GetApp() { return app; }
+    VtCSimulationDataController& GetController() { return *app.GetController(); }
+
+    /// Null, after a message, when no scene can be shown.
+    VtCPanoramicDocument* NewDocument();
+
+    /// What the command ends with: 1 after an error message, else 0.
+    int GetExitStatus() { return host.GetMessages().HasErrors() ? 1 : 0; }
+
+private:
+    ConsoleHost host;
+    VtCPanoramicApp app;
+};
+
+} // namespace console

@@ -1,0 +1,48 @@
+#pragma once
+
+#include <set>
+#include <string>
+
+#include <osg/Matrixd>
+
+#include "render/models/ModelPackage.h"
+#include "render/models/ModelRequest.h"
+
+/// The reading of one model: what is asked, and the report as it grows. A model is refused by throwing
+/// `std::runtime_error` with a reason that makes sense behind the model's path.
+class ReadContext
+{
+public:
+    explicit ReadContext(ModelRequest modelRequest);
+
+    /// A loss or repair to tell the user; the same sentence is told once, and after many only their number.
+    void Warn(const std::string& sentence);
+
+    /// The file of a texture or part as the model names it: an absolute or relative path or file URI, looked for beside
+    /// the model, then by its bare name, then in the customer's and the product's library, with any case. Empty, after
+    /// a note of where it was looked for, when there is none.
+    std::string Find(const std::string& reference, const std::string& what);
+
+    /// Takes down a file that the model depends on.
+    void NoteFile(const std::string& path);
+
+    const ModelRequest request;
+    const std::string folder; ///< of the model, without a trailing slash
+    ModelReport report;
+    std::set<std::string> textures; ///< files that the graph must hold as images in the end
+
+private:
+    std::size_t warnings = 0;
+};
+
+/// The text of a model file, made ready for the stock reader, and what that reader would have dropped.
+struct PreparedText
+{
+    std::string text;
+    osg::Matrixd toModel;         ///< from the file's axes and unit to y-up metres
+    bool hasTurnedRoot = false;   ///< the stock reader puts a transform of its own on top
+    unsigned mainTextureUnit = 0; ///< where the stock reader puts the diffuse texture
+};
+
+/// A group that ends with this is to be seen from both sides; the stock reader carries names and nothing else.
+inline constexpr const char* twoSidedMark = "__px_two_sided";

@@ -1,0 +1,185 @@
+#include "ReadModel.h"
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <set>
+#include <sstream>
+#include <stdexcept>
+
+#include <osg/Geometry>
+#include <osg/MatrixTransform>
+#include <osg/TriangleIndexFunctor>
+#include <osgDB/FileNameUtils>
+#include <osgDB/ReadFile>
+#include <osgDB/Registry>
+#include <osgUtil/MeshOptimizers>
+#include <osgUtil/Optimizer>
+
+#include "ColladaText.h"
+#include "Description.h"
+#include "GraphBuilder.h"
+#include "Preparation.h"
+#include "StateBuilder.h"
+#include "StockReader.h"
+#include "VrmlText.h"
+
+namespace fs = std::filesystem;
+
+namespace
+{
+
+constexpr std::uintmax_t maxFileSize = std::uintmax_t{1} << 30;
+
+std::string ReadWholeFile(const std::string& path)
+{
+    std::error_code error;
+    if (!fs::exists(path, error))
+        throw std::runtime_error("there is no such file");
+    if (!fs::is_regular_file(path, error))
+        throw std::runtime_error("it is no file");
+    if (fs::file_size(path, error) > maxFileSize)
+        throw std::runtime_error("it is larger than 1 GB");
+    std::ifstream file(path, std::ios::binary);
+    if (!file)
+        throw std::runtime_error("it may not be read");
+    std::string content{std::istreambuf_iterator<char>(file), {}};
+    if (content.empty())
+        throw std::runtime_error("it is empty");
+    return content;
+}
+
+/// Counts what the program shows as the model's size.
+class Counter : public osg::NodeVisitor
+{
+public:
+    explicit Counter(ModelReport& modelReport) : osg::NodeVisitor(TRAVERSE_ALL_CHILDREN), report(modelReport) {}
+
+    void apply(osg::Geode& geode) override
+    {
+        for (unsigned i = 0; i < geode.getNumDrawables(); ++i)
+        {
+            const osg::Geometry* geometry = geode.getDrawable(i)->asGeometry();
+            if (!seen.insert(geometry).second)
+                continue;
+            ++report.drawables;
+            report.vertices += geometry->getVertexArray()->getNumElements();
+            for (unsigned p = 0; p < geometry->getNumPrimitiveSets(); ++p)
+                report.polygons += geometry->getPrimitiveSet(p)->getNumPrimitives();
+            CountTextures(*geometry->getStateSet());
+        }
+    }
+
+private:
+    void CountTextures(const osg::StateSet& state)
+    {
+        for (unsigned unit = 0; unit < StateBuilder::maxUnits; ++unit)
+        {
+            const auto* texture =
+                dynamic_cast<const osg::Texture2D*>(state.getTextureAttribute(unit, osg::StateAttribute::TEXTURE));
+            if (texture && seen.insert(texture->getImage()).second)
+                report.textureBytes += texture->getImage()->getTotalSizeInBytes();
+        }
+    }
+
+    ModelReport& report;
+    std::set<const void*> seen;
+};
+
+/// The model below its correction of axes and unit, on request turned to z-up.
+osg::ref_ptr<osg::Group> Placed(osg::ref_ptr<osg::Group> graph, osg::Matrixd matrix, const ModelRequest& request)
+{
+    if (request.IsOn("useVrmlTransform", false))
+        matrix.postMult(osg::Matrixd(1, 0, 0, 0, 0, 0, 1, 0, 0, -1, 0, 0, 0, 0, 0, 1));
+    if (matrix.isIdentity())
+        return graph;
+    osg::ref_ptr<osg::MatrixTransform> placing = new osg::MatrixTransform(matrix);
+    placing->setDataVariance(osg::Object::STATIC);
+    for (unsigned i = 0; i < graph->getNumChildren(); ++i)
+        placing->addChild(graph->getChild(i));
+    graph->removeChildren(0, graph->getNumChildren());
+    graph->addChild(placing);
+    return graph;
+}
+
+std::string Encode(const osg::Group& graph)
+{
+    osgDB::ReaderWriter* binary = osgDB::Registry::instance()->getReaderWriterForExtension("osgb");
+    if (!binary)
+        throw std::runtime_error("the scene graph library's plug-in for \"osgb\" is missing");
+    osg::ref_ptr<osgDB::Options> options = new osgDB::Options("WriteImageHint=IncludeData");
+    options->setPluginStringData("WriteImageHint", "IncludeData");
+    std::ostringstream stream;
+    if (!binary->writeNode(graph, stream, options.get()).success() || !stream)
+        throw std::runtime_error("it can't be handed on");
+    return std::move(stream).str();
+}
+
+std::string ReadChecked(ReadContext& context)
+{
+    const ModelRequest& request = context.request;
+    context.NoteFile(request.path);
+    std::string content = ReadWholeFile(request.path);
+    fs::current_path(context.folder);
+    const Description description(context);
+
+    const std::string extension = osgDB::getLowerCaseFileExtension(request.path);
+    PreparedText prepared =
+        extension == "wrl" ? PrepareVrml(std::move(content), context) : PrepareCollada(std::move(content), context);
+    StateBuilder states(context, prepared.mainTextureUnit);
+    osg::ref_ptr<osg::Group> graph;
+    {
+        // The stock graph goes before transforms are worked into vertices, or every array would be copied once more.
+        const osg::ref_ptr<osg::Node> stock = ReadWithStockReader(extension, std::move(prepared.text));
+        graph = GraphBuilder(context, states).Build(*stock, prepared.hasTurnedRoot);
+    }
+    for (const std::string& path : context.textures) // those that the graph doesn't hold; of a material nobody uses?
+        if (!osgDB::readRefImageFile(path))
+            context.Warn("the texture \"" + path + "\" can't be read");
+    graph = Placed(graph, prepared.toModel, request);
+    graph->setName(osgDB::getStrippedName(request.path));
+
+    // Tangents don't turn with a transform that is worked in later, so it is done now. A group stays as it is.
+    if (context.report.parts.empty())
+    {
+        osgUtil::Optimizer optimizer;
+        optimizer.optimize(graph,
+                           osgUtil::Optimizer::STATIC_OBJECT_DETECTION | osgUtil::Optimizer::FLATTEN_STATIC_TRANSFORMS);
+    }
+    if (extension == "wrl") // the stock reader gives every corner a vertex of its own
+    {
+        osgUtil::IndexMeshVisitor indexer;
+        graph->accept(indexer);
+        indexer.makeMesh();
+    }
+    description.AddTextures(*graph, states);
+    description.AddShaders(*graph);
+
+    Counter counter(context.report);
+    graph->accept(counter);
+    if (context.report.drawables == 0 && context.report.parts.empty())
+        throw std::runtime_error("it holds no geometry" +
+                                 (context.report.warnings.empty() ? "" : "; " + context.report.warnings.front()));
+    return Encode(*graph);
+}
+
+} // namespace
+
+std::string ReadModel(const ModelRequest& request)
+{
+    ReadContext context(request);
+    std::string graph;
+    try
+    {
+        graph = ReadChecked(context);
+    }
+    catch (const std::runtime_error& e)
+    {
+        context.report.error = e.what();
+    }
+    catch (const std::length_error&)
+    {
+        context.report.error = "it holds sizes that can't be";
+    }
+    return PackModel(context.report, graph);
+}

@@ -1,0 +1,89 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+#include <osg/ref_ptr>
+#include <osg/Vec4f>
+#include <osgViewer/View>
+
+#include "host/Graphics.h"
+
+class VtC3DObserver;
+class VtCOsgCameramanipulator;
+class VtIViewFrame;
+
+/// Everything about a view of the scene except its window: camera, viewport, projection, observer.
+///
+/// Without an `osgViewer::View`, which arrives after the windows, everything is stored and nothing is drawn.
+class VtCBase3DView
+{
+public:
+    explicit VtCBase3DView(VtIViewFrame& viewFrame) : frame(viewFrame) {}
+    virtual ~VtCBase3DView();
+    VtCBase3DView(const VtCBase3DView&) = delete;
+    VtCBase3DView& operator=(const VtCBase3DView&) = delete;
+
+    virtual void setName(const std::wstring& newName) { name = newName; }
+    const std::wstring& getName() const { return name; }
+
+    /// Pane number, 1 to 4.
+    virtual void setViewPosition(std::int32_t position) { viewPosition = position; }
+    std::int32_t getViewPosition() const { return viewPosition; }
+
+    /// Null is ignored.
+    void attachView(osgViewer::View* newView);
+    osgViewer::View* getView() const { return view.get(); }
+
+    /// 0 to 255 each; nothing without a view.
+    void setClearColor(int red, int green, int blue);
+
+    /// Metres.
+    void setFarClipPlane(float distance);
+    void setNearClipPlane(float distance);
+
+    /// Degrees: half of what is seen across in a landscape pane, and upright in a portrait one. Marks the document as
+    /// changed if it differs.
+    void setViewAngle(float angle);
+
+    float getNearClipPlane() const { return nearClipPlane; }
+    float getFarClipPlane() const { return farClipPlane; }
+    float getViewAngle() const { return viewAngle; }
+
+    /// The pane has this size now; an empty one has no viewport.
+    void resize(const host::Rectangle& rectangle);
+
+    /// Looks through `newObserver` from now on; null is ignored.
+    void assignObserver(VtC3DObserver* newObserver);
+
+    /// Null before the first assignment.
+    VtC3DObserver* getObserver() const { return observer; }
+
+    /// Levels the camera; nothing without a view and an observer.
+    void straightenCamera();
+
+    bool isInViewer() const;
+
+    /// Draws one more frame to count; takes half a second.
+    std::int32_t getVisiblePolygonCount();
+
+protected:
+    VtCOsgCameramanipulator* GetManipulator() const;
+
+    VtIViewFrame& frame;
+
+private:
+    void updateProjection();
+
+    float nearClipPlane = 0.015f;
+    float farClipPlane = 10000.0f;
+    float viewAngle = 40.0f;
+    std::int32_t width = 0;
+    std::int32_t height = 0;
+    std::int32_t polygonCount = 0;
+    osg::Vec4f clearColor{200 / 255.0f, 230 / 255.0f, 1.0f, 1.0f};
+    std::wstring name;
+    std::int32_t viewPosition = 0;
+    osg::ref_ptr<osgViewer::View> view;
+    VtC3DObserver* observer = nullptr; ///< one reference
+};

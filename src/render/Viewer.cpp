@@ -1,0 +1,311 @@
+#include "render/Viewer.h"
+
+#include <algorithm>
+#include <cfloat>
+#include <cstdlib>
+
+#include <osg/DisplaySettings>
+#include <osg/Notify>
+#include <osgDB/Registry>
+
+#include "base/Paths.h"
+#include "base/Text.h"
+#include "host/Clock.h"
+#include "render/CompositeViewer.h"
+#include "render/GpRenderer.h"
+#include "render/Statistics.h"
+#include "render/ViewerStats.h"
+
+bool viewerReady = false;
+bool renderingEnabled = true;
+osg::ref_ptr<osg::Stats> viewerStats;
+
+namespace
+{
+
+constexpr std::uint32_t pause = 100; // milliseconds between a change of views and the next frame
+
+constexpr double nearPlane = 0.015;
+constexpr double farPlane = 10000.0;
+constexpr double portraitAngle = 40.0;
+constexpr double landscapeAngle = 80.0;
+
+constexpr unsigned int multisamples = 8;
+
+VtTViewerServices services;
+osg::ref_ptr<VtCOsgCompositeViewer> viewer;
+osg::ref_ptr<osg::GraphicsContext> sharedContext;
+host::Window* sharedContextWindow = nullptr;
+
+template <class Result>
+Result Ask(const std::function<Result()>& function)
+{
+    return function ? function() : Result();
+}
+
+void Tell(const std::function<void()>& function)
+{
+    if (function)
+        function();
+}
+
+void Pause()
+{
+    if (services.clock)
+        services.clock->Sleep(pause);
+}
+
+void EnableRendering(bool flag)
+{
+    renderingEnabled = flag;
+    Pause();
+}
+
+/// Fonts and other data are looked up beside the program.
+void PublishModuleDirectory()
+{
+    if (services.moduleDirectory.empty())
+        return;
+
+    const std::string directory = base::NativePath(services.moduleDirectory).string();
+    setenv("OSG_FILE_PATH", directory.c_str(), 1);
+    // The library has read the variable already if anything was loaded before.
+    osgDB::FilePathList& paths = osgDB::Registry::instance()->getDataFilePathList();
+    if (std::find(paths.begin(), paths.end(), directory) == paths.end())
+        paths.push_front(directory);
+}
+
+osg::ref_ptr<osg::GraphicsContext::Traits> MakeTraits()
+{
+    osg::ref_ptr<osg::GraphicsContext::Traits> traits = new osg::GraphicsContext::Traits;
+    traits->x = 0;
+    traits->y = 0;
+    traits->width = 0;
+    traits->height = 0;
+    traits->windowDecoration = false;
+    traits->doubleBuffer = true;
+    traits->setInheritedWindowPixelFormat = true;
+    traits->supportsResize = true;
+    traits->useMultiThreadedOpenGLEngine = true;
+    traits->red = traits->green = traits->blue = traits->alpha = 8;
+    traits->depth = 24;
+    traits->stencil = 8;
+    if (Ask(services.multisampling))
+        traits->samples = multisamples;
+    return traits;
+}
+
+host::Rectangle UsedRectangle(const host::Rectangle& rectangle)
+{
+    host::Rectangle used = rectangle;
+    if ((used.width <= 0 || used.height <= 0) && sharedContextWindow)
+        used = sharedContextWindow->GetClientRectangle();
+    used.width = std::max(1, used.width);
+    used.height = std::max(1, used.height);
+    return used;
+}
+
+void SetUpProjection(osg::Camera& camera, int width, int height)
+{
+    const double aspect = static_cast<double>(width) / height;
+    double angle = portraitAngle;
+    if (width < height)
+        camera.setProjectionResizePolicy(osg::Camera::HORIZONTAL);
+    else
+    {
+        camera.setProjectionResizePolicy(osg::Camera::VERTICAL);
+        angle = landscapeAngle / aspect;
+    }
+    camera.setProjectionMatrixAsPerspective(angle, aspect, nearPlane, farPlane);
+}
+
+bool CardNeedsEmptyFrames()
+{
+    const std::wstring renderer = base::ToLower(base::Wide(Ask(services.cardRenderer)));
+    return renderer.find(L"nvs") != std::wstring::npos || renderer.find(L"geforce") != std::wstring::npos;
+}
+
+void DrawWithoutScene(osgViewer::View& view, bool suspendIdle)
+{
+    if (suspendIdle)
+    {
+        Tell(services.disconnectIdle);
+        EnableRendering(false);
+    }
+
+    const osg::ref_ptr<osg::Node> scene = view.getSceneData();
+    view.setSceneData(nullptr);
+    if (viewer)
+        viewer->frame(DBL_MAX);
+    view.setSceneData(scene.get());
+
+    if (suspendIdle)
+    {
+        Tell(services.connectIdle);
+        EnableRendering(true);
+    }
+}
+
+} // namespace
+
+void setViewerServices(VtTViewerServices newServices)
+{
+    services = std::move(newServices);
+}
+
+void createViewer()
+{
+    if (viewer)
+        return;
+
+    // The library tells of every file it tries at NOTICE.
+    osg::setNotifyLevel(osg::WARN);
+    PublishModuleDirectory();
+
+    viewer = new VtCOsgCompositeViewer;
+    osg::ref_ptr<VtCOsgViewerStats> stats = new VtCOsgViewerStats("Glide Panel");
+    stats->collectStats("frame_rate", true);
+    viewerStats = stats;
+    viewer->SetStats(*stats);
+    viewerReady = true;
+}
+
+void destroyViewer()
+{
+    if (viewer)
+    {
+        if (viewer->areThreadsRunning())
+            viewer->stopThreading();
+        while (viewer->getNumViews() > 0)
+        {
+            const osg::ref_ptr<osgViewer::View> view = viewer->getView(0);
+            view->setSceneData(nullptr);
+            viewer->removeView(view.get());
+        }
+    }
+    viewer = nullptr;
+    viewerReady = false;
+    sharedContext = nullptr;
+    sharedContextWindow = nullptr;
+}
+
+osgViewer::CompositeViewer* getViewer()
+{
+    return viewer.get();
+}
+
+void createSharedContext(host::Window& window)
+{
+    sharedContextWindow = &window;
+    const osg::ref_ptr<osg::GraphicsContext::Traits> traits = MakeTraits();
+    sharedContext = services.graphics ? services.graphics->CreateContext(*traits, window) : nullptr;
+}
+
+osg::GraphicsContext* getSharedContext()
+{
+    return sharedContext.get();
+}
+
+osg::ref_ptr<osg::GraphicsContext> createViewContext(host::Window& window)
+{
+    if (!services.graphics)
+        return nullptr;
+
+    const host::Rectangle client = window.GetClientRectangle();
+    const osg::ref_ptr<osg::GraphicsContext::Traits> traits = MakeTraits();
+    traits->width = client.width;
+    traits->height = client.height;
+    traits->sharedContext = sharedContext.get();
+    return services.graphics->CreateContext(*traits, window);
+}
+
+osg::ref_ptr<osgViewer::View> createView(host::Window& window, const host::Rectangle& rectangle)
+{
+    osg::ref_ptr<osgViewer::View> view = new osgViewer::View;
+    osg::ref_ptr<osg::DisplaySettings> settings = new osg::DisplaySettings;
+    settings->setDefaults();
+    settings->setDisplayType(osg::DisplaySettings::MONITOR);
+    settings->setDepthBuffer(true);
+    settings->setStereo(false);
+    settings->setDoubleBuffer(true);
+
+    osg::Camera& camera = *view->getCamera();
+    camera.setRenderer(new VtCOsgGpRenderer(&camera));
+    camera.setClearMask(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
+    camera.setClearStencil(0);
+    camera.setComputeNearFarMode(osg::CullSettings::DO_NOT_COMPUTE_NEAR_FAR);
+    camera.setDisplaySettings(settings.get());
+    camera.setGraphicsContext(createViewContext(window).get());
+
+    const host::Rectangle used = UsedRectangle(rectangle);
+    camera.setViewport(0, 0, used.width, used.height);
+    SetUpProjection(camera, used.width, used.height);
+    return view;
+}
+
+void addViewToViewer(osgViewer::View* view)
+{
+    if (view && viewerReady)
+        viewer->AddView(*view);
+}
+
+void removeViewFromViewer(osgViewer::View* view)
+{
+    if (view && viewerReady)
+        viewer->removeView(view);
+}
+
+bool isViewInViewer(const osgViewer::View* view)
+{
+    if (!viewer)
+        return false;
+    for (unsigned int index = 0; index < viewer->getNumViews(); ++index)
+        if (viewer->getView(index) == view)
+            return true;
+    return false;
+}
+
+void RenderViewerFrame()
+{
+    if (renderingEnabled && viewerReady)
+        viewer->frame(DBL_MAX); // the simulation time of the frame is the viewer's own clock, not that of the data
+}
+
+void renderEmptyFrame(bool suspendIdle)
+{
+    osgViewer::View* view = Ask(services.activeView);
+    if (view && Ask(services.hasScene) && CardNeedsEmptyFrames())
+        DrawWithoutScene(*view, suspendIdle);
+}
+
+void renderEmptyFrameOfView(osgViewer::View* view, bool suspendIdle)
+{
+    if (view && CardNeedsEmptyFrames())
+        DrawWithoutScene(*view, suspendIdle);
+}
+
+double getFrameRate()
+{
+    double value = 0.0;
+    if (viewerStats && !viewerStats->getAveragedAttribute("Frame rate", value, false))
+        value = 0.0;
+    return value;
+}
+
+std::int32_t getVisiblePolygonCount(osgViewer::View* view, std::int32_t polygonCount)
+{
+    osg::Stats* stats = view ? view->getCamera()->getStats() : nullptr;
+    if (!stats)
+        return polygonCount;
+
+    EnableRendering(false);
+    stats->collectStats("scene", true);
+    EnableRendering(true);
+    RenderViewerFrame();
+    EnableRendering(false);
+
+    const std::int32_t counted = SumPolygons(*stats);
+    stats->collectStats("scene", false);
+    EnableRendering(true);
+    return counted;
+}
