@@ -75,9 +75,9 @@ std::filesystem::path ConfigurationFolder()
 SystemPaths::SystemPaths(const IniFile& configuration, const std::filesystem::path& data,
                          const std::filesystem::path& moduleFolder)
     : objects(
-          LibraryRoot("PANORAMIC_OBJECTS", configuration, "Objects", data / "example" / "objects" / "advanced")),
+          LibraryRoot("PANORAMIC_OBJECTS", configuration, "Objects", data / "example" / "Vantor Objects" / "advanced")),
       customer(LibraryRoot("PANORAMIC_CUSTOMER_OBJECTS", configuration, "CustomerObjects",
-                           data / "example" / "customer"))
+                           data / "example" / "Customer_Objects"))
 {
     if (!base::ToLower(objects).ends_with(presentSubfolder))
         objects += presentSubfolder;

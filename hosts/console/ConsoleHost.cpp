@@ -8,12 +8,6 @@
 namespace console
 {
 
-std::wstring ConsoleVariables::GetText(const std::wstring& name) const
-{
-    const auto at = texts.find(name);
-    return at == texts.end() ? std::wstring() : at->second;
-}
-
 namespace
 {
 

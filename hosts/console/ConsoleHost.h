@@ -1,7 +1,6 @@
 #pragma once
 
 #include <filesystem>
-#include <map>
 #include <memory>
 #include <string>
 
@@ -35,23 +34,18 @@ private:
     std::int32_t state = host::windowNormal;
 };
 
-/// Keeps what the component publishes, for the command to read.
+/// A console has no status line, so what the component publishes for it goes nowhere.
 class ConsoleVariables : public host::Variables
 {
 public:
     explicit ConsoleVariables(host::IdleSource& source) : idleSource(source) {}
 
-    void SetText(const std::wstring& name, const std::wstring& value) override { texts[name] = value; }
-    void SetBool(const std::wstring& name, bool value) override { switches[name] = value; }
+    void SetText(const std::wstring&, const std::wstring&) override {}
+    void SetBool(const std::wstring&, bool) override {}
     host::IdleSource* GetIdleSource() override { return &idleSource; }
-
-    /// Empty for a variable that was never set.
-    std::wstring GetText(const std::wstring& name) const;
 
 private:
     host::IdleSource& idleSource;
-    std::map<std::wstring, std::wstring> texts;
-    std::map<std::wstring, bool> switches;
 };
 
 /// Nobody is there to ask, so every question stays without an answer.
@@ -60,6 +54,7 @@ class ConsoleQuestions : public host::Questions
 public:
     std::optional<std::wstring> AskSaveFile(const host::FileQuestion&) override { return std::nullopt; }
     std::optional<std::wstring> AskOpenFile(const host::FileQuestion&) override { return std::nullopt; }
+    std::optional<std::size_t> AskReplacement(const host::ReplacementQuestion&) override { return std::nullopt; }
 };
 
 /// The program around the component on a console: messages and progress on standard error, settings under the XDG
@@ -88,7 +83,6 @@ public:
     hosts::IdleLoop& GetIdleLoop() { return loop; }
     ConsoleMessages& GetMessages() { return messages; }
     Terminal& GetTerminal() { return terminal; }
-    const ConsoleVariables& GetPublished() const { return variables; }
 
     /// Messages of the command itself, by their number in the texts; paths come in their own form.
     void ShowError(std::uint32_t number, const std::string& first = {}, const std::string& second = {});

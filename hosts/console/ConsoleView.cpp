@@ -34,8 +34,8 @@ osg::ref_ptr<osg::LightSource> Sun()
     osg::ref_ptr<osg::Light> light = new osg::Light;
     light->setLightNum(1);
     light->setPosition(osg::Vec4(-0.45F, -0.6F, 0.66F, 0.0F)); // a direction: the last is 0
-    light->setAmbient(osg::Vec4(0.38F, 0.40F, 0.45F, 1.0F));
-    light->setDiffuse(osg::Vec4(0.85F, 0.83F, 0.78F, 1.0F));
+    light->setAmbient(osg::Vec4(0.50F, 0.52F, 0.56F, 1.0F));
+    light->setDiffuse(osg::Vec4(1.00F, 0.97F, 0.90F, 1.0F));
     light->setSpecular(osg::Vec4(0.6F, 0.6F, 0.55F, 1.0F));
     osg::ref_ptr<osg::LightSource> source = new osg::LightSource;
     source->setLight(light);

@@ -21,7 +21,6 @@ namespace
 constexpr long activity = 9000;
 constexpr std::uint32_t progressInterval = 100; // milliseconds
 constexpr long progressSteps = 100;
-constexpr int sheetColumns = 3;
 constexpr int sheetCell = 480; // pixels
 
 } // namespace
@@ -59,15 +58,14 @@ void Playback::Run(const volatile std::sig_atomic_t& interrupted)
 {
     view.LookAt(viewArguments.eye, viewArguments.look);
     session.GetController().SetSpeed(arguments.speed);
-    host::Clock& clock = session.GetHost().GetClock();
     host::Progress& progress = *session.GetHost().GetProgress();
 
     progress.ConnectProgressActivity(activity, session.GetHost().GetTexts().GetText(textPlaying), {});
-    const std::int64_t start = clock.Counter();
+    start = session.GetHost().GetClock().Counter();
     for (int pass = 1; pass <= arguments.passes; ++pass)
         if (!PlayPass(pass, interrupted))
             break;
-    const double seconds = static_cast<double>(clock.Counter() - start) / static_cast<double>(clock.CounterFrequency());
+    const double seconds = SecondsSinceStart();
     session.GetController().StopPlay();
     progress.DisconnectProgressActivity(activity);
 
@@ -99,6 +97,12 @@ bool Playback::PlayPass(int pass, const volatile std::sig_atomic_t& interrupted)
     return ended && !interrupted;
 }
 
+double Playback::SecondsSinceStart() const
+{
+    const host::Clock& clock = session.GetHost().GetClock();
+    return static_cast<double>(clock.Counter() - start) / static_cast<double>(clock.CounterFrequency());
+}
+
 double Playback::CurrentTime() const
 {
     return session.GetController().GetRouter().GetTimestampOfCurrent().value_or(0.0);
@@ -106,15 +110,20 @@ double Playback::CurrentTime() const
 
 void Playback::TakeDueShots()
 {
-    if (nextShot >= arguments.shots.size())
+    if (nextShot >= arguments.shots.size() || arguments.shots[nextShot].time > CurrentTime())
         return;
+    VtCSimulationDataController& controller = session.GetController();
+    const auto shown = static_cast<long>(controller.GetRouter().GetRecent({}));
     const double now = CurrentTime();
     while (nextShot < arguments.shots.size() && arguments.shots[nextShot].time <= now)
         Take(arguments.shots[nextShot++]);
+    controller.ShowFrame({}, shown);
 }
 
 void Playback::Take(const Shot& shot)
 {
+    // The replay has gone on a little; the picture is to be of the shot's own time, on any machine.
+    GoToTime(session, shot.time, viewArguments.scene.data);
     view.LookAt(shot.eye, shot.look);
     session.GetApp().RedrawNow();
     const osg::ref_ptr<osg::Image> picture = view.Read();
@@ -142,7 +151,6 @@ void Playback::ShowProgress(int pass)
     lastProgress = now;
     const std::optional<TimeSpan> span = GetTimeSpan(session);
     std::wstring text = arguments.passes > 1 ? fmt::format(L"pass {} of {}, ", pass, arguments.passes) : L"";
-    const std::wstring fps = session.GetHost().GetPublished().GetText(L"fps");
     host::Progress& progress = *session.GetHost().GetProgress();
     if (span && span->last > span->first)
     {
@@ -154,14 +162,17 @@ void Playback::ShowProgress(int pass)
     }
     else
         text += fmt::format(L"frame {}", session.GetController().GetRouter().GetRecent({}));
-    progress.SetProgressDescription(activity, fps.empty() ? text : text + L", " + fps + L" fps");
+    const double seconds = SecondsSinceStart();
+    progress.SetProgressDescription(
+        activity, seconds > 0.0 ? fmt::format(L"{}, {:.1f} fps", text, static_cast<double>(frames) / seconds) : text);
 }
 
 void Playback::WriteContactSheet()
 {
     if (pictures.empty())
         return;
-    const int columns = std::min<int>(sheetColumns, static_cast<int>(pictures.size()));
+    const auto count = static_cast<int>(pictures.size());
+    const int columns = count > 4 && count % 4 == 0 ? 4 : std::min(count, 3); // the fewest empty cells
     const osg::ref_ptr<osg::Image> sheet = hosts::ComposeContactSheet(pictures, columns, sheetCell);
     if (!sheet)
         return;

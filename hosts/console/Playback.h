@@ -47,12 +47,14 @@ private:
     void WriteContactSheet();
     void PrintResult(double seconds) const;
     double CurrentTime() const;
+    double SecondsSinceStart() const;
 
     Session& session;
     ConsoleView& view;
     const ViewArguments& viewArguments;
     PlaybackArguments arguments;
     std::size_t nextShot = 0;
+    std::int64_t start = 0; ///< counter of the clock
     std::uint64_t frames = 0;
     double played = 0.0;
     std::uint32_t lastProgress = 0;

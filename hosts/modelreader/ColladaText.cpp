@@ -263,7 +263,8 @@ PreparedText PrepareCollada(std::string content, ReadContext& context)
             used.emplace(base::Trim(image.child_value()));
     for (pugi::xml_node image : elements.Named("init_from"))
     {
-        if (std::string_view(image.parent().name()) != "image" || !used.contains(image.parent().attribute("id").value()))
+        if (std::string_view(image.parent().name()) != "image" ||
+            !used.contains(image.parent().attribute("id").value()))
             continue;
         const std::string path = context.Find(std::string(base::Trim(image.child_value())), "texture");
         if (path.empty())

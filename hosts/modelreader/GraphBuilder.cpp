@@ -9,6 +9,7 @@
 #include <osg/Material>
 #include <osg/MatrixTransform>
 #include <osg/Switch>
+#include <osg/TriangleIndexFunctor>
 #include <osgUtil/SmoothingVisitor>
 
 #include "GeometryCheck.h"
@@ -50,6 +51,44 @@ bool NeedsNormals(const osg::Geometry& geometry)
         if (geometry.getPrimitiveSet(i)->getMode() >= GL_TRIANGLES)
             return true;
     return false;
+}
+
+bool IsMirroring(const osg::Transform& transform)
+{
+    osg::Matrix matrix;
+    transform.computeLocalToWorldMatrix(matrix, nullptr);
+    const osg::Vec3d x(matrix(0, 0), matrix(0, 1), matrix(0, 2));
+    const osg::Vec3d y(matrix(1, 0), matrix(1, 1), matrix(1, 2));
+    const osg::Vec3d z(matrix(2, 0), matrix(2, 1), matrix(2, 2));
+    return (x ^ y) * z < 0;
+}
+
+/// Triangles in the opposite sense. In a mirror they would show their backs, which aren't drawn.
+void TurnRound(osg::Geometry& geometry)
+{
+    struct Turner
+    {
+        osg::ref_ptr<osg::DrawElementsUInt> triangles = new osg::DrawElementsUInt(GL_TRIANGLES);
+
+        void operator()(unsigned a, unsigned b, unsigned c)
+        {
+            for (const unsigned index : {a, c, b})
+                triangles->push_back(index);
+        }
+    };
+    osg::TriangleIndexFunctor<Turner> turner;
+    osg::Geometry::PrimitiveSetList sets;
+    for (unsigned i = 0; i < geometry.getNumPrimitiveSets(); ++i)
+    {
+        osg::PrimitiveSet* set = geometry.getPrimitiveSet(i);
+        if (set->getMode() >= GL_TRIANGLES)
+            set->accept(turner);
+        else
+            sets.push_back(set);
+    }
+    if (!turner.triangles->empty())
+        sets.push_back(turner.triangles);
+    geometry.setPrimitiveSetList(sets);
 }
 
 osg::Vec4 Diffuse(const osg::StateSet* state)
@@ -100,7 +139,10 @@ GraphBuilder::Built GraphBuilder::BuildNode(osg::Node& source, const Inherited& 
         inherited.name = name;
     inherited.state = states.Merge(above.state.get(), source.getStateSet());
 
-    const Key key(&source, inherited.state.get(), inherited.name, inherited.twoSided);
+    if (const osg::Transform* transform = source.asTransform(); transform && IsMirroring(*transform))
+        inherited.mirrored = !inherited.mirrored;
+
+    const Key key(&source, inherited.state.get(), inherited.name, inherited.twoSided, inherited.mirrored);
     if (const auto at = known.find(key); at != known.end())
         return at->second;
 
@@ -111,7 +153,7 @@ GraphBuilder::Built GraphBuilder::BuildNode(osg::Node& source, const Inherited& 
     {
         osg::ref_ptr<osg::Geode> around = new osg::Geode;
         around->setName(inherited.name);
-        AddDrawable(*around, drawable, {above.state, inherited.name, inherited.twoSided});
+        AddDrawable(*around, drawable, {above.state, inherited.name, inherited.twoSided, inherited.mirrored});
         if (around->getNumDrawables() > 0)
             built.node = around;
     }
@@ -185,6 +227,8 @@ void GraphBuilder::AddDrawable(osg::Geode& geode, osg::Drawable* drawable, const
     }
     const osg::ref_ptr<osg::StateSet> state = states.Merge(inherited.state.get(), geometry->getStateSet());
     const bool hasColours = DropPlainColours(*geometry, Diffuse(state.get()));
+    if (inherited.mirrored)
+        TurnRound(*geometry);
     geometry->setStateSet(states.Make(state.get(), hasColours, inherited.twoSided).get());
     if (NeedsNormals(*geometry))
         osgUtil::SmoothingVisitor::smooth(*geometry, osg::DegreesToRadians(60.0));

@@ -33,8 +33,9 @@ private:
         osg::ref_ptr<osg::StateSet> state;
         std::string name;
         bool twoSided = false;
+        bool mirrored = false; ///< by an odd number of mirroring transforms
     };
-    using Key = std::tuple<const osg::Node*, const osg::StateSet*, std::string, bool>;
+    using Key = std::tuple<const osg::Node*, const osg::StateSet*, std::string, bool, bool>;
     struct Built
     {
         osg::ref_ptr<osg::Node> node;

@@ -2,7 +2,6 @@
 
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <set>
 #include <sstream>
 #include <stdexcept>
@@ -43,7 +42,9 @@ std::string ReadWholeFile(const std::string& path)
     std::ifstream file(path, std::ios::binary);
     if (!file)
         throw std::runtime_error("it may not be read");
-    std::string content{std::istreambuf_iterator<char>(file), {}};
+    std::string content(static_cast<std::size_t>(fs::file_size(path, error)), '\0');
+    file.read(content.data(), static_cast<std::streamsize>(content.size()));
+    content.resize(static_cast<std::size_t>(file.gcount()));
     if (content.empty())
         throw std::runtime_error("it is empty");
     return content;
@@ -128,10 +129,12 @@ std::string ReadChecked(ReadContext& context)
         extension == "wrl" ? PrepareVrml(std::move(content), context) : PrepareCollada(std::move(content), context);
     StateBuilder states(context, prepared.mainTextureUnit);
     osg::ref_ptr<osg::Group> graph;
+    std::string complaint;
     {
         // The stock graph goes before transforms are worked into vertices, or every array would be copied once more.
-        const osg::ref_ptr<osg::Node> stock = ReadWithStockReader(extension, std::move(prepared.text));
-        graph = GraphBuilder(context, states).Build(*stock, prepared.hasTurnedRoot);
+        const StockGraph stock = ReadWithStockReader(extension, std::move(prepared.text));
+        graph = GraphBuilder(context, states).Build(*stock.root, prepared.hasTurnedRoot);
+        complaint = stock.complaint;
     }
     for (const std::string& path : context.textures) // those that the graph doesn't hold; of a material nobody uses?
         if (!osgDB::readRefImageFile(path))
@@ -158,8 +161,11 @@ std::string ReadChecked(ReadContext& context)
     Counter counter(context.report);
     graph->accept(counter);
     if (context.report.drawables == 0 && context.report.parts.empty())
-        throw std::runtime_error("it holds no geometry" +
-                                 (context.report.warnings.empty() ? "" : "; " + context.report.warnings.front()));
+    {
+        if (!context.report.warnings.empty())
+            complaint = context.report.warnings.front();
+        throw std::runtime_error("it holds no geometry" + (complaint.empty() ? "" : ": " + complaint));
+    }
     return Encode(*graph);
 }
 

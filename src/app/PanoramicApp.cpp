@@ -82,7 +82,8 @@ void VtCPanoramicApp::ConnectToOtherComponents()
                                                                         .texts = host.GetTexts(),
                                                                         .messages = messageHandler,
                                                                         .configuration = configuration,
-                                                                        .progress = progress});
+                                                                        .progress = progress,
+                                                                        .questions = host.GetQuestions()});
     ConnectViewer();
 }
 

@@ -23,9 +23,9 @@ enum class Severity : std::int32_t
 struct Message
 {
     std::uint32_t number = 0; ///< 0: `text` holds the whole message
-    std::wstring first{};       ///< replaces %1 of the numbered text
-    std::wstring second{};      ///< replaces %2
-    std::wstring text{};        ///< only without a number
+    std::wstring first{};     ///< replaces %1 of the numbered text
+    std::wstring second{};    ///< replaces %2
+    std::wstring text{};      ///< only without a number
     std::wstring title{};
     std::wstring category{};
     Severity severity = Severity::information;

@@ -39,8 +39,8 @@ public:
 
     virtual SplitterWindow& GetSplitter() = 0;
 
-    /// Calls `tick` every `period` milliseconds from the host's event loop, until `KillTimer`. A timer of that id starts
-    /// over.
+    /// Calls `tick` every `period` milliseconds from the host's event loop, until `KillTimer`. A timer of that id
+    /// starts over.
     virtual void StartTimer(std::uint32_t id, std::uint32_t period, std::function<void()> tick) = 0;
     virtual void KillTimer(std::uint32_t id) = 0;
 };

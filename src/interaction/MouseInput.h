@@ -11,8 +11,8 @@ public:
 
 /// Remembers which view's input holds the mouse of a scene, and tells the old and the new one when that changes.
 ///
-/// The objects aren't owned, and a view that goes away doesn't say so: whoever reads them must know that their view still
-/// exists.
+/// The objects aren't owned, and a view that goes away doesn't say so: whoever reads them must know that their view
+/// still exists.
 class VtCMouseInputManager
 {
 public:

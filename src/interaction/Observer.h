@@ -22,18 +22,18 @@ class VtISettingsWriter;
 /// A place to look from: a position and a rotation of its own, or a rule that derives them from a moving body.
 ///
 /// It turns them into one view matrix (scene to camera; the camera looks along its -z, y up) and hands that to the
-/// cameras of all views that look through it. With no offsets the camera looks along the followed body's x axis with the
-/// body's z up. Of the base it uses neither model nor node; `position` is the eye, in the scene, metres.
+/// cameras of all views that look through it. With no offsets the camera looks along the followed body's x axis with
+/// the body's z up. Of the base it uses neither model nor node; `position` is the eye, in the scene, metres.
 class VtC3DObserver : public VtC3DBody
 {
 public:
-    /// Belongs to `parent`. A free observer has a record of its own kind (type 9) and its name as its id; any other gets
-    /// `id`, or a fresh one when that is empty.
+    /// Belongs to `parent`. A free observer has a record of its own kind (type 9) and its name as its id; any other
+    /// gets `id`, or a fresh one when that is empty.
     VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection, const std::wstring& name,
                   bool inTree, bool freeByBirth, const std::wstring& id);
 
-    /// The frame cycle's step: the placement for where the body is now, pushed to the cameras. Nothing while no view looks
-    /// through it.
+    /// The frame cycle's step: the placement for where the body is now, pushed to the cameras. Nothing while no view
+    /// looks through it.
     void Update();
 
     // Placement of a free observer.
@@ -48,8 +48,8 @@ public:
     void setMatrix(const osg::Matrixd& matrix, bool update);
     const osg::Matrixd& GetViewMatrix() const { return viewMatrix; }
 
-    /// Takes over where the mouse left the camera (`cameraRotation`: camera axes to scene), and writes it to the record,
-    /// in the form that reads back as the same view.
+    /// Takes over where the mouse left the camera (`cameraRotation`: camera axes to scene), and writes it to the
+    /// record, in the form that reads back as the same view.
     void StoreFreeView(const osg::Vec3f& eye, const osg::Quat& cameraRotation);
 
     // The cameras of the views that look through it; not owned.
@@ -148,6 +148,6 @@ private:
     std::int32_t followMode = followFixed;
     std::wstring followModeName;
     VtC3DMovableBody* connectedBody = nullptr; ///< one reference
-    std::wstring connectedBodyName; ///< of a body that the scene doesn't hold
+    std::wstring connectedBodyName;            ///< of a body that the scene doesn't hold
     VtCSmoothFollower follower;
 };

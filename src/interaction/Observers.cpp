@@ -141,6 +141,46 @@ void VtC3DObservers::ReleaseBody(VtC3DMovableBody& body)
             observer->Disconnect();
 }
 
+VtCGlidePanelAbstractNavigatorObject* VtC3DObservers::GetDefaultObserver(int index) const
+{
+    return index == 0 ? free1 : free2;
+}
+
+VtCGlidePanelAbstractNavigatorObject& VtC3DObservers::MakeObserver(const std::wstring& name, const std::wstring& id)
+{
+    return CreateObserver(name, true, id);
+}
+
+std::vector<VtTMissingTarget> VtC3DObservers::GetMissingTargets() const
+{
+    std::vector<VtTMissingTarget> missing;
+    for (VtC3DObserver* observer : GetObservers())
+    {
+        const std::wstring body = observer->GetConnectedBodyName();
+        if (IsFreeObserver(*observer) || observer->GetConnectedBody() || body.empty())
+            continue;
+        auto at =
+            std::find_if(missing.begin(), missing.end(),
+                         [&](const VtTMissingTarget& target) { return base::EqualsNoCase(target.bodyName, body); });
+        if (at == missing.end())
+            at = missing.insert(missing.end(), {body, {}});
+        at->observers.push_back(observer);
+    }
+    return missing;
+}
+
+void VtC3DObservers::SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody& body)
+{
+    for (VtC3DObserver* observer : GetObservers())
+    {
+        if (std::find(missing.observers.begin(), missing.observers.end(), observer) == missing.observers.end())
+            continue;
+        observer->SetConnectedBody(&body);
+        if (const osg::ref_ptr<VtISceneObject> record = observer->GetAttributeObject())
+            record->Write(L"attached_to", body.GetName());
+    }
+}
+
 void VtC3DObservers::ClearFollowers()
 {
     for (std::size_t i = 0; i < GetChildren().size(); ++i)
@@ -222,15 +262,14 @@ void VtC3DObservers::LoadDefaultObservers(const std::wstring& modelName)
 void VtC3DObservers::MakeNamesDistinct(const std::vector<VtC3DObserver*>& made)
 {
     const std::vector<VtC3DObserver*> all = GetObservers();
-    const bool clash = std::any_of(made.begin(), made.end(),
-                                   [&](const VtC3DObserver* one)
-                                   {
-                                       return std::count_if(all.begin(), all.end(),
-                                                            [&](const VtC3DObserver* other) {
-                                                                return base::EqualsNoCase(other->GetName(),
-                                                                                          one->GetName());
-                                                            }) > 1;
-                                   });
+    const bool clash =
+        std::any_of(made.begin(), made.end(),
+                    [&](const VtC3DObserver* one)
+                    {
+                        return std::count_if(all.begin(), all.end(),
+                                             [&](const VtC3DObserver* other)
+                                             { return base::EqualsNoCase(other->GetName(), one->GetName()); }) > 1;
+                    });
     if (!clash)
         return;
     std::size_t longest = 0;

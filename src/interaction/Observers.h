@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "scene/AbstractNavigatorObject.h"
+#include "scene/SceneParts.h"
 #include "scene/SceneServices.h"
 
 namespace host
@@ -18,9 +19,9 @@ class VtC3DObserver;
 class VtIInteractionServices;
 class VtISettingsReader;
 
-/// The observers of a scene. Two of them, "Free1" and "Free2", can't be removed. All names are compared without regard to
-/// case.
-class VtC3DObservers : public VtCGlidePanelAbstractNavigatorObject, public VtISceneObservers
+/// The observers of a scene. Two of them, "Free1" and "Free2", can't be removed. All names are compared without regard
+/// to case.
+class VtC3DObservers : public VtCGlidePanelAbstractNavigatorObject, public VtISceneObservers, public VtIObserverRecords
 {
 public:
     /// `defaultsFile` holds the observers that a new model is given; it need not exist.
@@ -53,6 +54,12 @@ public:
     void UpdateObservers() override;
     void ReleaseBody(VtC3DMovableBody& body) override;
 
+    VtIObserverRecords* GetRecords() override { return this; }
+    VtCGlidePanelAbstractNavigatorObject* GetDefaultObserver(int index) const override;
+    VtCGlidePanelAbstractNavigatorObject& MakeObserver(const std::wstring& name, const std::wstring& id) override;
+    std::vector<VtTMissingTarget> GetMissingTargets() const override;
+    void SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody& body) override;
+
     /// Forgets the followed rotations of an earlier run.
     void ClearFollowers();
 
@@ -70,8 +77,8 @@ public:
     /// Makes the default observers for a model of that file name ("Sedan.dae"); nothing without their file.
     void LoadDefaultObservers(const std::wstring& modelName);
 
-    /// Default observers for each name of `movables` ("Sedan|Van") that is a body of the scene, riding on it. Says so when
-    /// the scene has no bodies.
+    /// Default observers for each name of `movables` ("Sedan|Van") that is a body of the scene, riding on it. Says so
+    /// when the scene has no bodies.
     void GenerateDefaultObservers(const std::wstring& movables);
 
     VtIInteractionServices& GetInteraction() const { return interaction; }

@@ -20,6 +20,7 @@
 #include "render/DrawableCollector.h"
 #include "render/ModelNormals.h"
 #include "render/models/ModelReader.h"
+#include "render/TextureCollector.h"
 
 namespace
 {
@@ -81,6 +82,15 @@ public:
         VtCOsgAssetManager::getInstance().setShaderParameter(node, kind, name, type, value, shaderName);
     }
     std::wstring getShaderDirectory() const override { return VtCOsgAssetManager::getInstance().getShaderDirectory(); }
+    void emptyCache() override { VtCOsgAssetManager::destroyInstance(); }
+    void preloadModels(const std::vector<std::wstring>& paths, bool useVrmlTransform) override
+    {
+        VtCOsgAssetManager::getInstance().preloadModels(paths, useVrmlTransform);
+    }
+    std::vector<std::wstring> collectTextureFiles(osg::Node& node) const override
+    {
+        return VtCOsgAssetManager::getInstance().collectTextureFiles(node);
+    }
 };
 
 /// Drawables that want a shader must still be there when it is assigned, with a state set that is theirs.
@@ -160,6 +170,22 @@ void VtCOsgAssetManager::destroyInstance()
 {
     delete instance;
     instance = nullptr;
+}
+
+void VtCOsgAssetManager::emptyCache()
+{
+    models.clear();
+    modelTimes.clear();
+    xmlAttributes.clear();
+    programs.clear();
+    shaders.clear();
+}
+
+std::vector<std::wstring> VtCOsgAssetManager::collectTextureFiles(osg::Node& node) const
+{
+    VtCOsgTextureCollector collector;
+    node.accept(collector);
+    return collector.fileNames;
 }
 
 VtIModelLibrary& VtCOsgAssetManager::getLibrary()

@@ -54,7 +54,7 @@ public:
     osg::Group* readModel(const std::wstring& path, bool useVrmlTransform);
 
     /// Reads those of `paths` that aren't in memory all at once, so that `loadModel` finds them ready.
-    void preloadModels(const std::vector<std::wstring>& paths, bool useVrmlTransform);
+    void preloadModels(const std::vector<std::wstring>& paths, bool useVrmlTransform) override;
 
     std::string getXmlAttributes(const std::wstring& path) override;
 
@@ -77,6 +77,11 @@ public:
     void dirtyPrograms();
 
     std::wstring getShaderDirectory() const override { return shaderDirectory; }
+
+    /// Empties this instance. Those who hold `getLibrary` get a new one instead.
+    void emptyCache() override;
+
+    std::vector<std::wstring> collectTextureFiles(osg::Node& node) const override;
 
     /// Names of the attributes that hold a texture file.
     const std::vector<std::wstring>& getTextureAttributeNames() const { return textureAttributeNames; }

@@ -2,8 +2,8 @@
 
 #include "interaction/CameraManipulator.h"
 #include "interaction/Observer.h"
-#include "render/ViewFrame.h"
 #include "render/Viewer.h"
+#include "render/ViewFrame.h"
 #include "scene/SceneServices.h"
 
 VtCBase3DView::~VtCBase3DView()

@@ -1,13 +1,17 @@
 #include "render/ChildFrame.h"
 
+#include "base/Text.h"
 #include "host/Clock.h"
 #include "host/ViewWindows.h"
+#include "interaction/InteractionServices.h"
 #include "interaction/MouseInput.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
 #include "render/PanoramicView.h"
 #include "render/Viewer.h"
 #include "scene/Body.h"
+#include "scene/Scene3D.h"
+#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 namespace
@@ -33,10 +37,14 @@ VtCChildFrame::VtCChildFrame(VtTChildFrameServices frameServices)
     createViewer();
     splitter = std::make_unique<VtCSplitterEx>(*this, window->GetSplitter());
     GiveDefaultObservers();
+    if (VtCScene3D* scene = services.document.GetScene())
+        scene->SetViews(this);
 }
 
 VtCChildFrame::~VtCChildFrame()
 {
+    if (VtCScene3D* scene = services.document.GetScene(); scene && scene->GetViews() == this)
+        scene->SetViews(nullptr);
     window->KillTimer(creationTimer);
     activeView = nullptr;
     splitter.reset();
@@ -49,7 +57,8 @@ void VtCChildFrame::Pause() const
 
 void VtCChildFrame::GiveDefaultObservers()
 {
-    const auto free = [this](int pane) { return pane % 2 == 1 ? services.observers.GetFree2() : services.observers.GetFree1(); };
+    const auto free = [this](int pane)
+    { return pane % 2 == 1 ? services.observers.GetFree2() : services.observers.GetFree1(); };
     for (int pane = 1; pane <= 4; ++pane)
         if (VtC3DObserver* observer = free(pane))
             splitter->getView(pane)->assignObserverByName(observer->GetName());
@@ -115,6 +124,30 @@ void VtCChildFrame::activateView(VtCPanoramicView& view)
 {
     services.mouseInputManager.setActiveInput(view.getMouseInput());
     activeView = &view;
+}
+
+void VtCChildFrame::ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id)
+{
+    VtCPanoramicView* view = splitter->getView(pane);
+    if (!view)
+        return;
+    // The values bring the new id with them, so the present one, which its own record is stored under, is kept here.
+    const VtISceneObject* own = view->getSceneObject();
+    const auto* ownId = own ? own->Find<std::wstring>(L"internal_id") : nullptr;
+    const std::wstring old = ownId ? *ownId : std::wstring();
+    view->ApplyAttributes(record);
+    view->RebindAttributes(id);
+    if (!old.empty() && !base::EqualsNoCase(old, id))
+        services.document.GetServices().store.RemoveObject(old);
+}
+
+void VtCChildFrame::ActivateObserver()
+{
+    VtC3DObserver* observer = activeView ? activeView->getObserver() : nullptr;
+    if (!observer)
+        return;
+    observer->SetAssigned(true);
+    services.interaction.SetHeadLightPosition(observer->GetPosition());
 }
 
 void VtCChildFrame::SelectBody(const VtC3DBody& body)

@@ -5,6 +5,7 @@
 
 #include "render/SplitterEx.h"
 #include "render/ViewFrame.h"
+#include "scene/SceneParts.h"
 
 namespace host
 {
@@ -31,7 +32,7 @@ struct VtTChildFrameServices
 ///
 /// The windows come first and are drawn to only when the creation timer has fired; until then rendering is held back.
 /// Gone before the document's observers and scene.
-class VtCChildFrame : public VtIViewFrame
+class VtCChildFrame : public VtIViewFrame, public VtISceneViews
 {
 public:
     explicit VtCChildFrame(VtTChildFrameServices frameServices);
@@ -54,7 +55,8 @@ public:
     void setFarClipPlane(float distance);
     void assignObserver(const VtC3DObserver& old, VtC3DObserver& substitute);
 
-    /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want one.
+    /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want
+    /// one.
     void ApplyLayout(std::int32_t layout);
 
     /// Hides the panes while an editor shows the picture in windows of its own, and shows them again.
@@ -69,6 +71,10 @@ public:
     VtCPanoramicView* GetActiveView() const override { return activeView; }
     void SelectBody(const VtC3DBody& body) override;
     void ShowSingleView() override { ApplyLayout(layoutSingle); }
+
+    void ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id) override;
+    void ApplyLayoutRecord(const std::wstring& id) override { splitter->ApplyLayoutRecord(id); }
+    void ActivateObserver() override;
 
 private:
     void GiveDefaultObservers();

@@ -30,8 +30,8 @@ enum class VtEViewKey
 
 /// One of the four panes of a scene: a window with a view, an observer and a record.
 ///
-/// The host tells of window events by the operations whose names begin with "On"; positions in pixels from the upper left
-/// corner. They do nothing unless a scene is loaded and the view exists.
+/// The host tells of window events by the operations whose names begin with "On"; positions in pixels from the upper
+/// left corner. They do nothing unless a scene is loaded and the view exists.
 class VtCPanoramicView : public VtCBase3DView, private IPropertyChangedCOMEvents
 {
 public:

@@ -1,9 +1,11 @@
 #include "render/SceneView.h"
 
 #include <limits>
+#include <vector>
 
 #include <osg/Camera>
 #include <osg/Light>
+#include <osg/Projection>
 #include <osgUtil/CullVisitor>
 #include <osgUtil/RenderStage>
 #include <osgUtil/StateGraph>
@@ -58,7 +60,8 @@ bool PruneRested(osgUtil::StateGraph& graph, unsigned int now, unsigned int fram
     return used;
 }
 
-/// Keeps the culling set of the camera's frustum, with the planes in it.
+/// Keeps the culling sets of the frustums of a frame, those of the camera and of projections inside the scene, with the
+/// planes in them.
 class RecyclingCullVisitor : public osgUtil::CullVisitor
 {
 public:
@@ -77,8 +80,58 @@ public:
     /// The first projection of a cull; those of cameras inside the scene are pushed on top of it as ever.
     void PushCameraProjection(osg::RefMatrix* projection)
     {
-        _projectionStack.push_back(projection);
         _projectionCullingStack.swap(keptSets);
+        SetProjection(projection);
+    }
+
+    void PopCameraProjection()
+    {
+        _projectionStack.pop_back();
+        _frustumVolume = -1.0f;
+        popCullingSet();
+    }
+
+    using osgUtil::CullVisitor::apply;
+
+    /// As the library does it, with a culling set that was kept.
+    void apply(osg::Projection& node) override
+    {
+        if (getComputeNearFarMode() != DO_NOT_COMPUTE_NEAR_FAR || !_occluderList.empty())
+        {
+            osgUtil::CullVisitor::apply(node);
+            return;
+        }
+
+        pushCurrentMask();
+        osg::StateSet* const state = node.getStateSet();
+        if (state)
+            pushStateSet(state);
+
+        const std::size_t level = depth++;
+        if (nestedSets.size() < depth)
+            nestedSets.resize(depth);
+        CullingStack outer;
+        outer.swap(_projectionCullingStack);
+        _projectionCullingStack.swap(nestedSets[level]);
+        SetProjection(createOrReuseMatrix(node.getMatrix()));
+
+        handle_cull_callbacks_and_traverse(node);
+
+        PopCameraProjection();
+        _projectionCullingStack.swap(nestedSets[level]);
+        _projectionCullingStack.swap(outer);
+        depth = level;
+
+        if (state)
+            popStateSet();
+        popCurrentMask();
+    }
+
+private:
+    /// Puts the frustum of `projection` into the one set of the present stack.
+    void SetProjection(osg::RefMatrix* projection)
+    {
+        _projectionStack.push_back(projection);
         if (_projectionCullingStack.empty())
             _projectionCullingStack.emplace_back();
 
@@ -95,15 +148,9 @@ public:
         pushCullingSet();
     }
 
-    void PopCameraProjection()
-    {
-        _projectionStack.pop_back();
-        _frustumVolume = -1.0f;
-        popCullingSet();
-    }
-
-private:
     CullingStack keptSets;
+    std::vector<CullingStack> nestedSets; ///< by how deep the projections lie in one another
+    std::size_t depth = 0;
 };
 
 } // namespace

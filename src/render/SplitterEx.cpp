@@ -6,8 +6,8 @@
 #include "host/Messages.h"
 #include "host/ViewWindows.h"
 #include "render/PanoramicView.h"
-#include "render/ViewFrame.h"
 #include "render/Viewer.h"
+#include "render/ViewFrame.h"
 #include "scene/RecordTables.h"
 #include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
@@ -15,7 +15,7 @@
 namespace
 {
 
-constexpr std::uint32_t textFirstPane = 6240; // the names of the panes follow one another
+constexpr std::uint32_t textFirstPane = 9010; // the names of the panes follow one another
 
 struct Place
 {
@@ -246,8 +246,8 @@ void VtCSplitterEx::UpdateRatios(const Extent& width, const Extent& height)
     rowRatio0 = Fraction(height.first, sumY, rowRatio0);
     rowRatio1 = Fraction(height.second, sumY, rowRatio1);
     if (windowLayout)
-        windowLayout->Write(L"splitter_position", std::vector<float>{static_cast<float>(columnRatio0),
-                                                                     static_cast<float>(rowRatio0)});
+        windowLayout->Write(L"splitter_position",
+                            std::vector<float>{static_cast<float>(columnRatio0), static_cast<float>(rowRatio0)});
 }
 
 void VtCSplitterEx::ApplyLayoutRecord(const std::wstring& id)
@@ -260,6 +260,7 @@ void VtCSplitterEx::ApplyLayoutRecord(const std::wstring& id)
         if (const auto* old = windowLayout->Find<std::wstring>(L"internal_id"); old && *old != id)
             store.RemoveObject(std::wstring(*old));
     windowLayout = record;
-    if (const auto* position = record->Find<std::vector<float>>(L"splitter_position"); position && position->size() == 2)
+    if (const auto* position = record->Find<std::vector<float>>(L"splitter_position");
+        position && position->size() == 2)
         setSplitterPosition((*position)[0], (*position)[1]);
 }

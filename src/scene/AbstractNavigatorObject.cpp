@@ -92,7 +92,8 @@ VtTSceneServices& VtCGlidePanelAbstractNavigatorObject::GetServices() const
 void VtCGlidePanelAbstractNavigatorObject::ApplyAttributes(VtISceneObject& source)
 {
     // Handlers may add attributes to the record that is being read.
-    const VtISceneObject::Attributes attributes = source.GetAttributes();
+    const VtISceneObject::Attributes& stored = source.GetAttributes();
+    const VtISceneObject::Attributes attributes(stored.begin(), stored.end());
     for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
     {
         const std::wstring& name = attribute->GetName();

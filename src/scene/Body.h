@@ -149,7 +149,7 @@ protected:
     static osg::Group* NodeOf(VtCGlidePanelAbstractNavigatorObject* object);
 
     /// Makes `node` the body's node, with user data that leads back to the body.
-    void SetTransformNode(osg::Group* node);
+    virtual void SetTransformNode(osg::Group* node);
 
     /// Once the model is in place: remembers the materials as the file gave them.
     void BuildMaterialMaps();
@@ -183,6 +183,7 @@ protected:
 
     bool selectable = true;
     bool fixedToWorld = false;
+    bool isGrouped = false;
     bool isGroupChild = false;
     std::vector<std::wstring> childIds; ///< of the parts of a group
 
@@ -190,9 +191,12 @@ protected:
     float transparency = 0;
     bool visible = true;
 
+    osg::Matrixd baseMatrix; ///< the fixed part of the transform
+
     osg::ref_ptr<osg::Group> parentNode;
     osg::ref_ptr<osg::Group> transformNode;
-    osg::ref_ptr<osg::Node> modelNode; ///< shared with other bodies, except in a clone
+    osg::MatrixTransform* matrixNode = nullptr; ///< `transformNode`, when that is a matrix transform
+    osg::ref_ptr<osg::Node> modelNode;          ///< shared with other bodies, except in a clone
 
 private:
     void SetPlacement(osg::Vec3f& vector, int axis, float value)
@@ -217,10 +221,4 @@ private:
     VtTMaterialMap fileMaterials;  ///< as the file gave them, never changed
     VtTMaterialMap materials;      ///< of the model that hangs in the graph now
     VtTMaterialMap cloneMaterials; ///< of `modelClone`
-
-protected:
-    // Behind one another, in front of what a movable body adds: every frame reads just these.
-    bool isGrouped = false;
-    osg::MatrixTransform* matrixNode = nullptr; ///< `transformNode`, when that is a matrix transform
-    osg::Matrixd baseMatrix;
 };

@@ -10,7 +10,7 @@ VtCOsgMatMapObject::VtCOsgMatMapObject(osg::Material& source)
 }
 
 VtCOsgMatMapObject::VtCOsgMatMapObject(const VtCOsgMatMapObject& other)
-    : osg::Referenced(),
+    : osg::Referenced(other),
       material(other.material),
       diffuse(other.diffuse),
       specular(other.specular),

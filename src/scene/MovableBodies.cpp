@@ -15,6 +15,27 @@ VtCMovableBodies::VtCMovableBodies(VtISceneDocument& owningDocument, osg::Group*
 void VtCMovableBodies::ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child)
 {
     std::erase_if(bodies, [&](VtC3DMovableBody* body) { return body == &child; });
+    motionsStale = true;
+}
+
+const std::vector<VtTBodyMotion*>& VtCMovableBodies::GetMotions()
+{
+    if (!motionsStale)
+        return motions;
+    motions.clear();
+    const auto add = [&](const VtC3DMovableBody& body)
+    {
+        if (!body.IsGrouped())
+            motions.push_back(&body.GetMotion());
+    };
+    for (const VtC3DMovableBody* body : bodies)
+    {
+        add(*body);
+        for (const VtC3DMovableBody* part : body->GetParts())
+            add(*part);
+    }
+    motionsStale = false;
+    return motions;
 }
 
 void VtCMovableBodies::RemoveBody(const std::wstring& id)

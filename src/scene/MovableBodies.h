@@ -1,9 +1,11 @@
 #pragma once
 
+#include <memory>
 #include <string>
 #include <vector>
 
 #include "scene/Bodies.h"
+#include "scene/BodyMotion.h"
 
 class VtC3DMovableBody;
 class VtCTrack;
@@ -23,6 +25,10 @@ public:
     /// The members, in collection order. A part of a grouped member isn't one.
     const std::vector<VtC3DMovableBody*>& GetBodies() const { return bodies; }
 
+    /// What a frame moves: every member that is no group, and in the place of a group its parts. Valid until a body
+    /// comes or goes.
+    const std::vector<VtTBodyMotion*>& GetMotions();
+
     /// Destroys the body of that id and marks the document as changed; nothing when there is none.
     void RemoveBody(const std::wstring& id);
 
@@ -37,5 +43,8 @@ private:
     friend class VtC3DMovableBody;
 
     std::vector<VtC3DMovableBody*> bodies;
+    std::shared_ptr<VtCMotionPool> pool = std::make_shared<VtCMotionPool>();
+    std::vector<VtTBodyMotion*> motions;
+    bool motionsStale = false;
     VtCTrack* track;
 };

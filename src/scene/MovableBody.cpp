@@ -40,12 +40,7 @@ VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePan
                                    const std::wstring& id)
     : VtC3DBody(owningDocument, &parentObject, name, path, inTree, id)
 {
-    auto* group = dynamic_cast<VtC3DMovableBody*>(&parentObject);
-    auto* collection = dynamic_cast<VtCMovableBodies*>(&parentObject);
-    if (group)
-        group->parts.push_back(this);
-    else if (collection)
-        collection->bodies.push_back(this);
+    JoinParent();
 
     VtTSceneServices& services = GetServices();
     modelNode = model ? model : services.models.loadModel(path, true);
@@ -60,7 +55,7 @@ VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePan
     SetTransformNode(transform);
     BuildMaterialMaps();
 
-    if (group)
+    if (dynamic_cast<VtC3DMovableBody*>(&parentObject))
         attributeObject = services.store.GetObject(internalId);
     if (!attributeObject)
         MakeAttributeObject(description, objectTypeMovableBody);
@@ -81,11 +76,34 @@ VtC3DMovableBody::~VtC3DMovableBody()
         parts.front()->RemoveAttributeObject();
         parts.front()->Destroy();
     }
+    pool->GiveBack(*motion);
+}
+
+void VtC3DMovableBody::JoinParent()
+{
+    auto* group = dynamic_cast<VtC3DMovableBody*>(GetParent());
+    auto* collection = dynamic_cast<VtCMovableBodies*>(group ? group->GetParent() : GetParent());
+    pool = collection ? collection->pool : std::make_shared<VtCMotionPool>();
+    motion = &pool->Take();
+    if (group)
+        group->parts.push_back(this);
+    else if (collection)
+        collection->bodies.push_back(this);
+    if (collection)
+        collection->motionsStale = true;
+}
+
+void VtC3DMovableBody::SetTransformNode(osg::Group* node)
+{
+    VtC3DBody::SetTransformNode(node);
+    motion->node = matrixNode;
 }
 
 void VtC3DMovableBody::ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child)
 {
     std::erase_if(parts, [&](VtC3DMovableBody* part) { return part == &child; });
+    if (auto* collection = dynamic_cast<VtCMovableBodies*>(GetParent()))
+        collection->motionsStale = true;
 }
 
 void VtC3DMovableBody::FillAttributes(const osg::Matrixd& insertTransform)
@@ -144,9 +162,20 @@ void VtC3DMovableBody::UpdateBaseTransform()
     ApplyTransform();
 }
 
-void VtC3DMovableBody::ApplyAnyTransform()
+void VtC3DMovableBody::SetLastTransformMatrix(const osg::Matrixd& matrix)
 {
-    SetTransform(baseMatrix * lastTransformMatrix);
+    motion->lastTransformMatrix = matrix;
+    motion->lastTransformMatrix(3, 3) = 1.0;
+    ApplyTransform();
+}
+
+void VtC3DMovableBody::ApplyTransform()
+{
+    motion->SetBase(baseMatrix);
+    if (isGrouped)
+        SetTransform(baseMatrix * motion->lastTransformMatrix);
+    else
+        motion->MoveNode();
 }
 
 void VtC3DMovableBody::SetTransform(const osg::Matrixd& matrix)
@@ -197,14 +226,14 @@ VtC3DMovableBody* VtC3DMovableBody::CloneIntoTrack(VtCMovableBodies& target, VtC
     clone->SetCenterX(center.x());
     clone->SetCenterY(center.y());
     clone->SetCenterZ(center.z());
-    clone->ConnectChannel(simulationDataIndex, {});
+    clone->ConnectChannel(motion->simulationDataIndex, {});
 
     if (clone->attributeObject && attributeObject)
     {
         for (const wchar_t* name : {L"position", L"scale", L"rotation", L"simulation_data_index"})
             if (const VtISceneAttribute* attribute = attributeObject->GetAttribute(name))
                 clone->WriteAttribute(name, attribute->GetValue());
-        clone->WriteAttribute(L"simulation_data_stream", simulationDataIndex);
+        clone->WriteAttribute(L"simulation_data_stream", motion->simulationDataIndex);
         clone->WriteAttribute(L"cloned_from", internalId);
         clone->WriteAttribute(L"track_id", trackNumber);
     }

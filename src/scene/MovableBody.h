@@ -1,11 +1,12 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
-#include "scene/AffineProduct.h"
 #include "scene/Body.h"
+#include "scene/BodyMotion.h"
 
 class VtCMovableBodies;
 class VtCTrack;
@@ -35,47 +36,24 @@ public:
     /// index. A group ignores it: its parts have channels of their own.
     void ConnectChannel(std::int32_t index, const std::wstring& stream);
 
-    std::int32_t GetSimulationDataIndex() const { return simulationDataIndex; }
+    std::int32_t GetSimulationDataIndex() const { return motion->simulationDataIndex; }
     const std::wstring& GetSimulationDataStream() const { return simulationDataStream; }
-    bool IsConnected() const { return simulationDataIndex != -1; }
+    bool IsConnected() const { return motion->simulationDataIndex != -1; }
 
     /// Compares the channel with those of the current data point; a group asks its parts.
     void UpdateConnectionState();
     std::int32_t GetConnectionState() const { return connectionState; }
 
     /// Moves the body by a frame's matrix; (3,3) of it counts as 1.
-    void SetLastTransformMatrix(const osg::Matrixd& matrix)
-    {
-        lastTransformMatrix = matrix;
-        lastTransformMatrix(3, 3) = 1.0;
-        ApplyTransform();
-    }
+    void SetLastTransformMatrix(const osg::Matrixd& matrix);
 
-    /// The same with the 16 floats of a frame's entry, column after column.
-    void SetLastTransformColumns(const float* values)
-    {
-        double* m = lastTransformMatrix.ptr();
-        for (int row = 0; row < 4; ++row)
-            for (int column = 0; column < 4; ++column)
-                m[row * 4 + column] = values[column * 4 + row];
-        m[15] = 1.0;
-        ApplyTransform();
-    }
+    const osg::Matrixd& GetLastTransformMatrix() const { return motion->lastTransformMatrix; }
 
-    const osg::Matrixd& GetLastTransformMatrix() const { return lastTransformMatrix; }
+    /// What a frame needs of this body. Not for a group, which its parts move.
+    VtTBodyMotion& GetMotion() const { return *motion; }
 
-    /// Sets the node to `baseMatrix` * `lastTransformMatrix`; a group hands it to its parts.
-    void ApplyTransform() override
-    {
-        if (matrixNode && !isGrouped && IsAffine(lastTransformMatrix))
-        {
-            osg::Matrixd placed(baseMatrix); // any value will do; the default constructor is a call
-            AffineProduct(baseMatrix, lastTransformMatrix, placed);
-            matrixNode->setMatrix(placed);
-        }
-        else
-            ApplyAnyTransform();
-    }
+    /// Sets the node to `baseMatrix` * the last matrix; a group hands it to its parts.
+    void ApplyTransform() override;
 
     void SetTransform(const osg::Matrixd& matrix) override;
     void UpdateBaseTransform() override;
@@ -108,18 +86,18 @@ public:
 protected:
     ~VtC3DMovableBody() override;
     void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child) override;
+    void SetTransformNode(osg::Group* node) override;
 
 private:
-    void ApplyAnyTransform();
+    void JoinParent();
     void FillAttributes(const osg::Matrixd& insertTransform);
     void ExpandGroup();
     void AddPart(const std::wstring& oldId, const std::wstring& newId, const std::wstring& path);
     void MoveAttribute(const std::wstring& oldName, const std::wstring& newName);
     void OnChannelNameChanged(const std::wstring& name);
 
-    std::int32_t simulationDataIndex = -1;
-    osg::Matrixd lastTransformMatrix;
-
+    std::shared_ptr<VtCMotionPool> pool; ///< where `motion` is from
+    VtTBodyMotion* motion;               ///< with the channel's index and the last matrix
     std::int32_t connectionState = notConnected;
     std::wstring simulationDataStream;
     osg::Matrixd groupChildMatrix; ///< of a part: its place inside the group

@@ -25,7 +25,7 @@ void VtC3DMovableBody::ConnectChannel(std::int32_t index, const std::wstring& st
         return;
 
     const VtTSceneServices& services = GetServices();
-    simulationDataIndex = index;
+    motion->simulationDataIndex = index;
     if (!stream.empty())
         simulationDataStream = stream;
     else if (index == -1)
@@ -49,9 +49,9 @@ void VtC3DMovableBody::ConnectChannel(std::int32_t index, const std::wstring& st
 void VtC3DMovableBody::UpdateConnectionState()
 {
     const std::vector<std::wstring>* channels = CurrentChannels(GetServices());
-    const bool offered =
-        channels && simulationDataIndex >= 0 && static_cast<std::size_t>(simulationDataIndex) < channels->size();
-    connectionState = simulationDataIndex == -1 ? notConnected : offered ? connected : channelMissing;
+    const std::int32_t index = motion->simulationDataIndex;
+    const bool offered = channels && index >= 0 && static_cast<std::size_t>(index) < channels->size();
+    connectionState = index == -1 ? notConnected : offered ? connected : channelMissing;
     for (VtC3DMovableBody* part : parts)
         part->UpdateConnectionState();
 }

@@ -145,6 +145,15 @@ VtEAttributeType AssumedAttributeType(std::wstring_view name)
     return Type::text;
 }
 
+std::optional<std::size_t> FixedListLength(std::wstring_view name)
+{
+    if (name == L"last_transform_matrix" || name == L"insert_transform_matrix")
+        return 16;
+    if (name == L"splitter_position")
+        return 2;
+    return std::nullopt;
+}
+
 osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType)
 {
     osg::ref_ptr<VtISceneObject> object = new VtISceneObject(objectType);

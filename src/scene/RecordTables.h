@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string_view>
@@ -29,6 +30,9 @@ std::optional<VtEAttributeType> FixedAttributeType(std::wstring_view name);
 /// The type of `name` when a text doesn't tell it: the fixed one, that of a part's attribute ("<id>_position"), or
 /// text.
 VtEAttributeType AssumedAttributeType(std::wstring_view name);
+
+/// How many numbers the list of that name holds in every record; nothing for lists of any length.
+std::optional<std::size_t> FixedListLength(std::wstring_view name);
 
 /// A new record with the values of a new object; null for a type without such a record.
 osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType);

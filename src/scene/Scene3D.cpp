@@ -5,6 +5,7 @@
 #include "host/Storage.h"
 #include "scene/MovableBody.h"
 #include "scene/RecordTables.h"
+#include "scene/SceneLoader.h"
 #include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 #include "scene/ShaderCollector.h"
@@ -183,6 +184,49 @@ void VtCScene3D::ChangeGlobalRenderMode(VtERenderMode mode, bool useOwnModes)
         return;
     SetGlobalRenderMode(mode, useOwnModes);
     document.SetModified(true);
+}
+
+bool VtCScene3D::LoadSceneFile(const std::wstring& path, bool skip)
+{
+    return !skip && VtCSceneLoader(*this).Load(path);
+}
+
+bool VtCScene3D::SaveSceneFile(const std::wstring& path)
+{
+    return document.GetServices().store.SaveFile(path);
+}
+
+bool VtCScene3D::SaveScene(const std::wstring& path)
+{
+    VtCGlidePanelAbstractNavigatorObject::Objects descendants;
+    movableBodies.front()->CollectDescendants(descendants);
+    for (VtCGlidePanelAbstractNavigatorObject* object : descendants)
+        if (auto* body = dynamic_cast<VtC3DMovableBody*>(object))
+            body->StoreLastTransform();
+    if (!SaveSceneFile(path))
+        return false;
+    document.SetModified(false);
+    return true;
+}
+
+void VtCScene3D::LoadBodiesFromFile(const std::wstring& path)
+{
+    VtCSceneLoader(*this).LoadBodies(path);
+}
+
+void VtCScene3D::LoadObjectsFromFile(const std::wstring& path)
+{
+    VtCSceneLoader(*this).LoadObjects(path);
+}
+
+void VtCScene3D::ResolveObserverTargets()
+{
+    VtCSceneLoader::ResolveObserverTargets(*this);
+}
+
+const std::wstring& VtCScene3D::GetFileError() const
+{
+    return document.GetServices().store.GetFileError();
 }
 
 void VtCScene3D::UpdateFrame()

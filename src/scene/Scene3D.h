@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include <osg/Group>
@@ -19,6 +20,7 @@ class VtC3DMovableBody;
 class VtCTrack;
 class VtISceneDocument;
 class VtISceneObservers;
+class VtISceneViews;
 
 /// One scene: the top of the scene graph, the collections of bodies, and the render mode of all of them.
 ///
@@ -88,6 +90,38 @@ public:
     /// The record of the render settings; null when the store has none to give.
     VtISceneObject* GetRenderSettings() const { return renderSettings.get(); }
 
+    // The scene file. Paths in the inner form. A record of a body without its name, file or id throws
+    // `VtCAttributeError`, which ends the load; what was built until then stays.
+
+    /// Builds everything that the file holds. False when it can't be read, the scene then being as it was, and with
+    /// `skip`, which does nothing.
+    bool LoadSceneFile(const std::wstring& path, bool skip);
+
+    /// Writes the records as they are. The file changes whole or not at all.
+    bool SaveSceneFile(const std::wstring& path);
+
+    /// Brings the placements of the movable bodies into their records, then writes them. The document counts as
+    /// unmodified only when that succeeds.
+    bool SaveScene(const std::wstring& path);
+
+    /// Builds the bodies alone, or everything but the bodies, for a scene that is loaded anew from two files.
+    void LoadBodiesFromFile(const std::wstring& path);
+    void LoadObjectsFromFile(const std::wstring& path);
+
+    /// Has the user choose bodies for the observers whose body is missing. Nothing without a user.
+    void ResolveObserverTargets();
+
+    /// Why the last of these failed: "scene.xml, line 3: ..."; empty when it didn't.
+    const std::wstring& GetFileError() const;
+
+    /// All image files of the scene's textures, as of the end of the last load.
+    const std::vector<std::wstring>& GetTextureFiles() const { return textureFiles; }
+    void SetTextureFiles(std::vector<std::wstring> files) { textureFiles = std::move(files); }
+
+    /// Not owned, may be null.
+    void SetViews(VtISceneViews* sceneViews) { views = sceneViews; }
+    VtISceneViews* GetViews() const { return views; }
+
     // The frame.
 
     /// Not owned, may be null.
@@ -116,4 +150,6 @@ private:
     VtCStaticBodies* staticBodies = nullptr;      ///< one reference
     std::vector<VtCMovableBodies*> movableBodies; ///< one reference each
     VtISceneObservers* observers = nullptr;
+    VtISceneViews* views = nullptr;
+    std::vector<std::wstring> textureFiles;
 };

@@ -1,8 +1,37 @@
 #include "scene/SceneObjectStore.h"
 
+#include "base/AtomicFile.h"
+#include "base/Ids.h"
+#include "base/Paths.h"
 #include "base/Text.h"
 #include "scene/ObjectText.h"
 #include "scene/RecordTables.h"
+#include "scene/SceneFileText.h"
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <string>
+
+namespace
+{
+
+// Empty on success, else the reason.
+std::string ReadWhole(const std::filesystem::path& path, std::string& content)
+{
+    std::error_code failure;
+    if (std::filesystem::is_directory(path, failure))
+        return std::strerror(EISDIR);
+    std::ifstream file(path, std::ios::binary);
+    if (!file)
+        return std::strerror(errno);
+    char part[1 << 16];
+    while (content.size() <= largestSceneText && (file.read(part, sizeof part) || file.gcount() > 0))
+        content.append(part, static_cast<std::size_t>(file.gcount()));
+    return file.bad() ? std::strerror(errno) : "";
+}
+
+} // namespace
 
 std::vector<osg::ref_ptr<VtISceneObject>> VtCSceneObjectStore::GetObjects() const
 {
@@ -58,4 +87,50 @@ std::wstring VtCSceneObjectStore::GetDefaultText(std::int32_t objectType) const
 {
     const osg::ref_ptr<VtISceneObject> object = MakeDefaultObject(objectType);
     return object ? WriteObjectText(*object) : std::wstring();
+}
+
+bool VtCSceneObjectStore::LoadFile(const std::wstring& path)
+{
+    ReadFile(path, {});
+    return fileError.empty();
+}
+
+std::vector<osg::ref_ptr<VtISceneObject>> VtCSceneObjectStore::ReadFile(const std::wstring& path, const Wanted& wanted)
+{
+    const std::filesystem::path file = base::NativePath(path);
+    std::string text;
+    const std::string reason = ReadWhole(file, text);
+    fileError = reason.empty() ? std::wstring() : base::Wide(file.string() + ": " + reason);
+    if (!fileError.empty())
+        return {};
+
+    VtTSceneRecords read = ParseSceneText(text);
+    if (!read.error.empty())
+    {
+        fileError = base::Wide(file.string() + ", " + read.error);
+        return {};
+    }
+    if (wanted)
+        std::erase_if(read.objects, [&](const osg::ref_ptr<VtISceneObject>& object) { return !wanted(*object); });
+    for (const osg::ref_ptr<VtISceneObject>& object : read.objects)
+    {
+        // A record without an id is nobody's, but it is written again.
+        const auto* id = object->Find<std::wstring>(L"internal_id");
+        const std::wstring key = id && !id->empty() ? *id : base::NewId();
+        RemoveObject(key);
+        AddObject(key, object);
+    }
+    return std::move(read.objects);
+}
+
+bool VtCSceneObjectStore::SaveFile(const std::wstring& path)
+{
+    fileError = base::Wide(base::WriteWholeFile(base::NativePath(path), WriteSceneText(GetObjects())));
+    return fileError.empty();
+}
+
+void VtCSceneObjectStore::RefreshObjects(const std::vector<std::wstring>& ids)
+{
+    if (grid)
+        grid->RefreshObjects(ids);
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <list>
 #include <string>
 #include <unordered_map>
@@ -16,6 +17,16 @@ struct VtTParsedObject
 {
     osg::ref_ptr<VtISceneObject> object; ///< null when the text isn't a record
     std::wstring error;                  ///< "line 3: attribute 'scale': ...", empty when all went well
+};
+
+/// What shows and edits records. The host's property grid implements it.
+class VtIPropertyGrid
+{
+public:
+    virtual ~VtIPropertyGrid() = default;
+
+    /// Shows the objects of these ids anew.
+    virtual void RefreshObjects(const std::vector<std::wstring>& ids) = 0;
 };
 
 /// The records of all objects, by their ids. Ids compare without regard to case.
@@ -41,6 +52,27 @@ public:
 
     /// The textual form of a new record of that type; empty for a type that has no default record.
     virtual std::wstring GetDefaultText(std::int32_t objectType) const = 0;
+
+    // Scene files (docs/scene-file.md). Paths in the inner form.
+
+    /// Which records of a file come in; none stands for all.
+    using Wanted = std::function<bool(const VtISceneObject&)>;
+
+    /// Takes the records of the file in, behind those that are there; one of the same id goes. False when the file
+    /// can't be read; the store is then as it was.
+    virtual bool LoadFile(const std::wstring& path) = 0;
+
+    /// The same, with the records as the result; empty when the file can't be read.
+    virtual std::vector<osg::ref_ptr<VtISceneObject>> ReadFile(const std::wstring& path, const Wanted& wanted) = 0;
+
+    /// Writes all records. The file changes whole or not at all; false when it can't be written.
+    virtual bool SaveFile(const std::wstring& path) = 0;
+
+    /// Why the last of these three failed: "scene.xml, line 3: ..."; empty when it didn't.
+    virtual const std::wstring& GetFileError() const = 0;
+
+    /// Has the property grid show these objects anew; nothing without one.
+    virtual void RefreshObjects(const std::vector<std::wstring>& ids) = 0;
 };
 
 /// The store of the component, in memory.
@@ -54,10 +86,20 @@ public:
     void Clear() override;
     void AddObject(const std::wstring& id, VtISceneObject* object) override;
     std::wstring GetDefaultText(std::int32_t objectType) const override;
+    bool LoadFile(const std::wstring& path) override;
+    std::vector<osg::ref_ptr<VtISceneObject>> ReadFile(const std::wstring& path, const Wanted& wanted) override;
+    bool SaveFile(const std::wstring& path) override;
+    const std::wstring& GetFileError() const override { return fileError; }
+    void RefreshObjects(const std::vector<std::wstring>& ids) override;
+
+    /// Not owned, may be null.
+    void SetPropertyGrid(VtIPropertyGrid* propertyGrid) { grid = propertyGrid; }
 
 private:
     using Records = std::list<std::pair<std::wstring, osg::ref_ptr<VtISceneObject>>>;
 
     Records records;
     std::unordered_map<std::wstring, Records::iterator> byId; ///< keys in lower case
+    std::wstring fileError;
+    VtIPropertyGrid* grid = nullptr;
 };

@@ -12,6 +12,7 @@ class Configuration;
 class LibraryPaths;
 class MessageHandler;
 class Progress;
+class Questions;
 class Texts;
 } // namespace host
 
@@ -24,6 +25,7 @@ class Node;
 
 class VtC3DMovableBody;
 class VtCScene3D;
+class VtIObserverRecords;
 class VtISceneObjectStore;
 
 /// Where bodies get their models and shaders from. The asset manager of the renderer implements it.
@@ -57,6 +59,15 @@ public:
 
     /// Folder of the shader files, with a trailing backslash.
     virtual std::wstring getShaderDirectory() const = 0;
+
+    /// Forgets every model and shader; bodies keep what they show. What is asked for from now on is read anew.
+    virtual void emptyCache() = 0;
+
+    /// Reads those of `paths` that aren't kept all at once, so that `loadModel` finds them ready.
+    virtual void preloadModels(const std::vector<std::wstring>& paths, bool useVrmlTransform) = 0;
+
+    /// The image files of the textures below `node`, each once.
+    virtual std::vector<std::wstring> collectTextureFiles(osg::Node& node) const = 0;
 };
 
 /// The channels of the current data point. The data point router implements it.
@@ -81,6 +92,9 @@ public:
 
     /// `body` is about to go: observers that ride on it stay where they are, not connected.
     virtual void ReleaseBody(VtC3DMovableBody& body) = 0;
+
+    /// Where stored observers go; null where none are taken.
+    virtual VtIObserverRecords* GetRecords() { return nullptr; }
 };
 
 /// What objects of a scene need from outside; made once by the application object.
@@ -94,6 +108,7 @@ struct VtTSceneServices
     VtIChannelSource* channels = nullptr;         ///< null until a controller exists
     host::Configuration* configuration = nullptr; ///< null: no tracks
     host::Progress* progress = nullptr;           ///< null: no progress is shown
+    host::Questions* questions = nullptr;         ///< null: nobody to ask
 };
 
 /// The document of a scene, as the scene and its objects see it.

@@ -16,9 +16,7 @@ constexpr std::int32_t defaultTrackFrames = 20000;
 } // namespace
 
 VtCSimulationDataController::VtCSimulationDataController(const VtTSimulationServices& hostServices)
-    : services(hostServices),
-      router(hostServices),
-      runningIndicator(hostServices.variables, hostServices.navigator)
+    : services(hostServices), router(hostServices), runningIndicator(hostServices.variables, hostServices.navigator)
 {
     ReadBufferSettings();
     router.SetFrameBufferSize(static_cast<unsigned long>(simulationBufferFrames));
@@ -33,9 +31,8 @@ VtCSimulationDataController::~VtCSimulationDataController()
 void VtCSimulationDataController::ReadBufferSettings()
 {
     const host::Configuration* configuration = services.configuration;
-    simulationBufferFrames =
-        std::max(configuration ? configuration->GetSimulationBufferFrames() : defaultSimulationFrames,
-                 GetMinimumBufferFrames());
+    simulationBufferFrames = std::max(
+        configuration ? configuration->GetSimulationBufferFrames() : defaultSimulationFrames, GetMinimumBufferFrames());
     trackBufferFrames = std::max(configuration ? configuration->GetTrackBufferFrames() : defaultTrackFrames, 0);
 }
 

@@ -6,11 +6,11 @@
 #include <string>
 
 #include "simdata/ControllerCommands.h"
+#include "simdata/points/SimulationDataFrames.h"
 #include "simdata/RunningIndicator.h"
 #include "simdata/SimulationDataRouter.h"
 #include "simdata/SimulationServices.h"
 #include "simdata/SimulationState.h"
-#include "simdata/points/SimulationDataFrames.h"
 
 /// The one place where the state of the simulation lives: the mode, online or offline, and the play state.
 ///

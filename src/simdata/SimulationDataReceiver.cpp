@@ -2,7 +2,6 @@
 
 #include "base/Text.h"
 #include "scene/MovableBodies.h"
-#include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "simdata/ActiveScene.h"
 #include "simdata/ChannelLists.h"
@@ -15,27 +14,20 @@ using namespace SimulationDataPoints;
 namespace
 {
 
-void MoveBody(VtC3DMovableBody& body, VtCSimulationDataFrame& frame)
+void MoveBodies(VtCMovableBodies& bodies, VtCSimulationDataFrame& frame)
 {
-    // -1 stands for no channel, and gives no data either.
-    if (const VtCSimulationData* data = frame.GetSimulationData(body.GetSimulationDataIndex()))
+    // Data multiply a point from the right, the scene from the left: the rows of one are the other's columns.
+    for (VtTBodyMotion* motion : bodies.GetMotions())
     {
-        // Data multiply a point from the right, the scene from the left: the rows of one are the other's columns.
-        float columns[4][4];
-        data->GetMatrix4x4(columns);
-        body.SetLastTransformColumns(columns[0]);
-    }
-}
-
-void MoveBodies(const VtCMovableBodies& bodies, VtCSimulationDataFrame& frame)
-{
-    for (VtC3DMovableBody* body : bodies.GetBodies())
-    {
-        if (!body->IsGrouped())
-            MoveBody(*body, frame);
-        else
-            for (VtC3DMovableBody* part : body->GetParts())
-                MoveBody(*part, frame);
+        const std::int32_t index = motion->simulationDataIndex; // -1 for no channel, which no frame has
+        if (const float* pose = frame.GetPose(index))
+            motion->SetLastTransformColumns(pose);
+        else if (const VtCSimulationData* data = frame.GetSimulationData(index))
+        {
+            float columns[4][4];
+            data->GetMatrix4x4(columns);
+            motion->SetLastTransformColumns(columns[0]);
+        }
     }
 }
 
@@ -72,7 +64,7 @@ void VtCSimulationDataReceiver::ApplyFrames(const VtCSimulationDataTracker& fram
     for (auto position = frames.GetHeadPosition(); position != 0;)
     {
         VtCSimulationDataFrame* frame = frames.GetNext(position);
-        const VtCMovableBodies* bodies = scene->GetMovableBodies(static_cast<int>(frame->GetTrackID()));
+        VtCMovableBodies* bodies = scene->GetMovableBodies(static_cast<int>(frame->GetTrackID()));
         if (!bodies)
             break;
         MoveBodies(*bodies, *frame);

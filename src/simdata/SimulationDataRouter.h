@@ -8,11 +8,11 @@
 #include "scene/SceneServices.h"
 #include "simdata/ChannelLists.h"
 #include "simdata/DataPointPlugins.h"
+#include "simdata/points/SimulationDataTracker.h"
 #include "simdata/RegistrationList.h"
 #include "simdata/ReplayClock.h"
 #include "simdata/SimulationServices.h"
 #include "simdata/SimulationState.h"
-#include "simdata/points/SimulationDataTracker.h"
 
 class VtCLoadProgressDisplay;
 class VtCSimulationDataChangeObject;

@@ -8,7 +8,7 @@
 #include <osg/Image>
 #include <osg/ref_ptr>
 
-#include "hosts/console/tests/TemporaryFolder.h"
+#include "tests/support/TemporaryFolder.h"
 
 /// Runs the command as its user does: the built program, in an empty folder, with settings of its own.
 class CommandFixture : public testing::Test

@@ -47,11 +47,14 @@ TEST_F(PlayCommand, PassesAndSpeedMultiply)
 
 TEST_F(PlayCommand, ShotsAreTakenWhenTheRunPassesThem)
 {
-    folder.Write("shots.txt", "# time eye look name\n1 5,0,10 5,0,0 end\n0 0,0,10 0,0,0 start # where it starts\n");
+    folder.Write(
+        "shots.txt",
+        "# time eye look name\n1 5,0,10 5,0,0 end\n0.33 3,0,6 3,0,0 middle\n0 0,0,10 0,0,0 start # where it starts\n");
     const Result result = Run({"play", "--movable", "Car=car.dae", "--data", "run.mdf", "--size", "160x90",
                                "--headless", "--pictures", "out/run", "--shots", "shots.txt", "--speed", "2"});
     EXPECT_EQ(result.status, 0) << result.error;
-    EXPECT_NE(result.out.find("out/run/start.png\nout/run/end.png\nout/run/contact-sheet.png\n"), std::string::npos)
+    EXPECT_NE(result.out.find("out/run/start.png\nout/run/middle.png\nout/run/end.png\nout/run/contact-sheet.png\n"),
+              std::string::npos)
         << result.out;
     const osg::ref_ptr<osg::Image> start = ReadPicture(folder.path / "out/run/start.png");
     const osg::ref_ptr<osg::Image> end = ReadPicture(folder.path / "out/run/end.png");
@@ -59,9 +62,16 @@ TEST_F(PlayCommand, ShotsAreTakenWhenTheRunPassesThem)
     EXPECT_TRUE(IsRed(At(*start, 0.5, 0.5))) << "the eye of the shot is above the start";
     EXPECT_TRUE(IsSky(At(*end, 0.5, 0.5)));
     EXPECT_TRUE(IsRed(At(*end, 0.5 + 5.0 / 16.8, 0.5)));
+    // A picture is of its own time, not of the frame that came next.
+    ASSERT_EQ(Run({"snapshot", "--movable", "Car=car.dae", "--data", "run.mdf", "--time", "0.33", "--eye", "3,0,6",
+                   "--look", "3,0,0", "--size", "160x90", "-o", "same.png"})
+                  .status,
+              0);
+    EXPECT_EQ(TemporaryFolder::Read(folder.path / "out/run/middle.png"),
+              TemporaryFolder::Read(folder.path / "same.png"));
     const osg::ref_ptr<osg::Image> sheet = ReadPicture(folder.path / "out/run/contact-sheet.png");
     ASSERT_TRUE(sheet);
-    EXPECT_GT(sheet->s(), sheet->t()) << "two pictures side by side";
+    EXPECT_GT(sheet->s(), sheet->t()) << "the pictures stand side by side";
 }
 
 TEST_F(PlayCommand, WithoutShotsPicturesLieAtEqualDistances)

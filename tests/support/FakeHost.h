@@ -249,8 +249,16 @@ public:
         return answer;
     }
 
+    std::optional<std::size_t> AskReplacement(const host::ReplacementQuestion& question) override
+    {
+        replacements.push_back(question);
+        return chosen;
+    }
+
     std::optional<std::wstring> answer;
+    std::optional<std::size_t> chosen;
     std::vector<host::FileQuestion> asked;
+    std::vector<host::ReplacementQuestion> replacements;
 };
 
 class LibraryPaths : public host::LibraryPaths

@@ -52,6 +52,13 @@ public:
                             const std::wstring& type, const std::wstring& value,
                             const std::wstring& shaderName) override;
     std::wstring getShaderDirectory() const override { return L"\\app\\Assets\\"; }
+    void emptyCache() override { ++emptied; }
+    void preloadModels(const std::vector<std::wstring>& paths, bool useVrmlTransform) override
+    {
+        for (const std::wstring& path : paths)
+            preloads.emplace_back(path, useVrmlTransform);
+    }
+    std::vector<std::wstring> collectTextureFiles(osg::Node&) const override { return textureFiles; }
 
     std::map<std::wstring, osg::ref_ptr<osg::Group>> models;
     std::map<std::wstring, std::string> descriptions;
@@ -59,6 +66,9 @@ public:
     std::vector<Shader> shaders;
     std::vector<Parameter> parameters;
     int clones = 0;
+    int emptied = 0;
+    std::vector<std::pair<std::wstring, bool>> preloads;
+    std::vector<std::wstring> textureFiles;
 };
 
 class ChannelSource : public VtIChannelSource
@@ -74,7 +84,9 @@ public:
 class SceneDocument : public VtISceneDocument
 {
 public:
-    SceneDocument() : services{store, models, paths, texts, messages, &channels, &configuration, &progress} {}
+    SceneDocument() : services{store, models, paths, texts, messages, &channels, &configuration, &progress, &questions}
+    {
+    }
 
     VtCScene3D* GetScene() const override { return scene; }
     void SetScene(VtCScene3D* newScene) override { scene = newScene; }
@@ -89,6 +101,7 @@ public:
     ChannelSource channels;
     Configuration configuration;
     Progress progress;
+    Questions questions;
     VtTSceneServices services;
     VtCScene3D* scene = nullptr;
     bool modified = false;

@@ -26,7 +26,10 @@ class SplitterWindow : public host::SplitterWindow
 {
 public:
     host::Rectangle GetClientRectangle() const override { return {0, 0, width, height}; }
-    host::PaneWindow& GetPane(int row, int column) override { return panes[static_cast<std::size_t>(row * 2 + column)]; }
+    host::PaneWindow& GetPane(int row, int column) override
+    {
+        return panes[static_cast<std::size_t>(row * 2 + column)];
+    }
     void Hide() override { shown = false; }
     void ShowMaximised() override { shown = true; }
 

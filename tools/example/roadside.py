@@ -137,7 +137,7 @@ def guard_rails(course: Course) -> Model:
         points = np.concatenate([plan, (z[None, :] - drop[:, None])[..., None]], axis=-1)
         uvs = np.stack(np.broadcast_arrays(s[:, None] / 2.0, np.linspace(0, 1, len(z))[None, :]), axis=-1)
         back = points.copy()
-        back[..., :2] += (plan[:, :1] - plan[:, 1:2]) * 0.3
+        back[..., :2] += plan[:, :1] - plan[:, 1:2]
         add_grid(mesh, "metal", points, None, uvs, flip=side < 0)
         add_grid(mesh, "metal", back, None, uvs, flip=side > 0)
         for at, off, sink in zip(s, offset, drop):

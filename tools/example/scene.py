@@ -21,7 +21,7 @@ from terrain import Terrain, in_field, terrain_model
 from van import van
 from wheel import wheel
 
-PRODUCT, CUSTOMER = "objects/advanced", "customer"
+PRODUCT, CUSTOMER = "Vantor Objects/advanced", "Customer_Objects"
 
 
 @dataclass(frozen=True)

@@ -8,8 +8,8 @@
 #include "hosts/common/HostMessages.h"
 #include "hosts/common/IniFile.h"
 #include "hosts/common/IniTexts.h"
-#include "hosts/console/tests/TemporaryFolder.h"
 #include "tests/support/FakeHost.h"
+#include "tests/support/TemporaryFolder.h"
 
 namespace
 {

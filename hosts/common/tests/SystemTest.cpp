@@ -9,8 +9,8 @@
 #include "hosts/common/IniFile.h"
 #include "hosts/common/SystemClock.h"
 #include "hosts/common/SystemPaths.h"
-#include "hosts/console/tests/TemporaryFolder.h"
 #include "tests/support/FakeHost.h"
+#include "tests/support/TemporaryFolder.h"
 
 namespace
 {
@@ -42,9 +42,9 @@ TEST(SystemPaths, LibrariesComeFromTheEnvironmentTheConfigurationOrTheExample)
     {
         const hosts::IniFile none{std::filesystem::path()};
         const hosts::SystemPaths paths(none, "/data", "/app/bin");
-        EXPECT_EQ(paths.GetObjectsPath(), L"\\data\\example\\objects\\advanced");
+        EXPECT_EQ(paths.GetObjectsPath(), L"\\data\\example\\Vantor Objects\\advanced");
         EXPECT_EQ(paths.GetObjectsSubfolder(), L"\\advanced");
-        EXPECT_EQ(paths.GetCustomerPath(), L"\\data\\example\\customer");
+        EXPECT_EQ(paths.GetCustomerPath(), L"\\data\\example\\Customer_Objects");
         EXPECT_EQ(paths.GetModuleDirectory(), L"\\app\\bin\\");
         EXPECT_EQ(hosts::SystemPaths(none, "/data", "").GetModuleDirectory(), L"");
     }

@@ -2,7 +2,7 @@
 
 #include "hosts/console/Arguments.h"
 #include "hosts/console/Shots.h"
-#include "hosts/console/tests/TemporaryFolder.h"
+#include "tests/support/TemporaryFolder.h"
 
 namespace
 {

@@ -8,7 +8,7 @@
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
-#include "simdata/tests/Allocations.h"
+#include "tests/support/HeapCount.h"
 
 namespace
 {
@@ -129,9 +129,9 @@ TEST_F(WholeStep, ASteadyPassAllocatesNothing)
         }
     };
     passes(20);
-    const std::size_t before = simtest::Allocations();
+    heap::Count count;
     passes(500);
-    EXPECT_EQ(simtest::Allocations() - before, 0U);
+    EXPECT_EQ(count.Stop(), 0);
     renderingEnabled = true;
     app.GetController()->StopPlay();
     Stop();

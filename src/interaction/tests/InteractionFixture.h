@@ -28,7 +28,10 @@ public:
         headLight = position;
         ++headLightMoves;
     }
-    void ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver&) override { replaced.push_back(gone.GetName()); }
+    void ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver&) override
+    {
+        replaced.push_back(gone.GetName());
+    }
 
     std::uint32_t sensitivity = 5;
     const osgViewer::View* activeView = nullptr;
@@ -69,7 +72,8 @@ protected:
 
     VtC3DMovableBody& MakeBody(const wchar_t* name)
     {
-        return *new VtC3DMovableBody(document, *scene->GetMovableBodies(0), name, L"", osg::Matrixd(), true, nullptr, {});
+        return *new VtC3DMovableBody(document, *scene->GetMovableBodies(0), name, L"", osg::Matrixd(), true, nullptr,
+                                     {});
     }
 
     /// A view that looks through `observer`.

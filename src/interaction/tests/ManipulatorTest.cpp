@@ -71,8 +71,8 @@ const osg::Matrixd facingNorth(1, 0, 0, 0, 0, 0, 1, 0, 0, -1, 0, 0, 10, 20, 2, 1
 
 } // namespace
 
-// Displacement in pixels from the press, held for one frame after the drag, at the default sensitivity: 100 pixels drive
-// 0.25 m and turn 0.025 rad a frame. The drag itself counts as one frame's motion too.
+// Displacement in pixels from the press, held for one frame after the drag, at the default sensitivity: 100 pixels
+// drive 0.25 m and turn 0.025 rad a frame. The drag itself counts as one frame's motion too.
 TEST_F(Manipulator, DrivesAFreeObserver)
 {
     struct Drag
@@ -85,10 +85,8 @@ TEST_F(Manipulator, DrivesAFreeObserver)
     };
     const int shift = VtCOsgCameramanipulator::keyShiftRight;
     const Drag drags[] = {
-        {"up drives forward", 0, 0, 100, {0, 0.5, 0}, 0},
-        {"down drives back", 0, 0, -40, {0, -0.2, 0}, 0},
-        {"right turns right", 0, 100, 0, {0, 0, 0}, 0.05},
-        {"shift pans sideways", shift, 100, 0, {0.5, 0, 0}, 0},
+        {"up drives forward", 0, 0, 100, {0, 0.5, 0}, 0},  {"down drives back", 0, 0, -40, {0, -0.2, 0}, 0},
+        {"right turns right", 0, 100, 0, {0, 0, 0}, 0.05}, {"shift pans sideways", shift, 100, 0, {0.5, 0, 0}, 0},
         {"shift pans up", shift, 0, 100, {0, 0, 0.5}, 0},
     };
     for (const Drag& drag : drags)
@@ -153,7 +151,8 @@ TEST_F(Manipulator, AnOffsetOnAMovingBodySnapsBack)
     const osg::Matrixd before = manipulator->getMatrix();
     EXPECT_TRUE(Send(Event::PUSH, 0, 0));
     Send(Event::DRAG, 0, 100);
-    // 5 * 0.005 * 0.02 = 0.0005 for turning, * 0.2 = 0.0001 for moving, * 0.1 for every translation: 100 pixels give 1 mm.
+    // 5 * 0.005 * 0.02 = 0.0005 for turning, * 0.2 = 0.0001 for moving, * 0.1 for every translation: 100 pixels give 1
+    // mm.
     const osg::Vec3d moved = Eye() - before.getTrans();
     EXPECT_NEAR(moved.length(), 0.001, 1e-6);
     EXPECT_NEAR(moved * (-osg::Vec3d(before(2, 0), before(2, 1), before(2, 2))), 0.001, 1e-6) << "forward";

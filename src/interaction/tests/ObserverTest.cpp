@@ -2,8 +2,8 @@
 #include <fstream>
 #include <random>
 
-#include "scene/EulerAngles.h"
 #include "interaction/tests/InteractionFixture.h"
+#include "scene/EulerAngles.h"
 
 namespace
 {
@@ -32,8 +32,8 @@ void ExpectNear(const osg::Vec3d& found, const osg::Vec3d& expected, double tole
 
 constexpr double radius = 50;
 
-// A car on a circle about the origin, driving anticlockwise with a bank of 0.1 rad: forward, left and up worked out from
-// the tangent and the radius alone.
+// A car on a circle about the origin, driving anticlockwise with a bank of 0.1 rad: forward, left and up worked out
+// from the tangent and the radius alone.
 struct OnCircle
 {
     osg::Vec3d at;
@@ -80,7 +80,8 @@ TEST_F(Observer, RidesFixedToTheBody)
         ExpectNear(sight.eye, car_.at - car_.forward * 6 + car_.left + car_.up * 2, 1e-4, "eye");
         ExpectNear(sight.look, car_.forward, 1e-5, "look");
         ExpectNear(sight.up, car_.up, 1e-5, "up");
-        ExpectNear(SightOf(views.front().manipulator->getInverseMatrix()).look, car_.forward, 1e-5, "the view's camera");
+        ExpectNear(SightOf(views.front().manipulator->getInverseMatrix()).look, car_.forward, 1e-5,
+                   "the view's camera");
     }
 }
 
@@ -182,7 +183,8 @@ TEST_F(Observer, FollowsThePositionOrOneOfItsAxes)
         VtC3DObserver& rider = Rider(rule.mode, L"");
         rider.SetTranslationOffset(osg::Vec3f(1, 2, 3));
         Look(rider);
-        car->SetLastTransformMatrix(osg::Matrixd::rotate(0.5, osg::Vec3d(0, 0, 1)) * osg::Matrixd::translate(10, 20, 30));
+        car->SetLastTransformMatrix(osg::Matrixd::rotate(0.5, osg::Vec3d(0, 0, 1)) *
+                                    osg::Matrixd::translate(10, 20, 30));
         scene->UpdateFrame();
         const Sight sight = SightOf(rider.GetViewMatrix());
         ExpectNear(sight.eye, rule.eye, 1e-5, "eye");

@@ -149,14 +149,14 @@ osgDB::ReaderWriter::ReadResult VtCModelReader::readNode(const std::string& path
 
 void VtCModelReader::Preload(const std::vector<std::string>& paths, const osgDB::Options* options)
 {
-    preloaded.clear();
     std::vector<std::string> keys;
     std::vector<std::vector<std::string>> arguments;
     for (const std::string& path : paths)
     {
         const ModelRequest request = ModelRequest::Make(path, options);
         const bool ours = acceptsExtension(osgDB::getLowerCaseFileExtension(path)) && FileStamp::Of(path).size >= 0;
-        if (!ours || std::find(keys.begin(), keys.end(), Key(request)) != keys.end() || !FindFinished(request).empty())
+        if (!ours || std::find(keys.begin(), keys.end(), Key(request)) != keys.end() ||
+            preloaded.contains(Key(request)) || !FindFinished(request).empty())
             continue;
         keys.push_back(Key(request));
         arguments.push_back(request.Arguments());

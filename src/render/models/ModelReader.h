@@ -39,7 +39,7 @@ public:
     /// "shaderNodes" stays valid until the next read.
     ReadResult readNode(const std::string& path, const osgDB::Options* options) const override;
 
-    /// Reads several models at once, for `readNode` to find them ready.
+    /// Reads several models at once, for `readNode` to find them ready. What nobody then reads stays until the end.
     void Preload(const std::vector<std::string>& paths, const osgDB::Options* options);
 
 private:

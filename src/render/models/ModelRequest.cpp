@@ -1,5 +1,7 @@
 #include "render/models/ModelRequest.h"
 
+#include <filesystem>
+
 #include <osgDB/Options>
 
 #include "base/Numbers.h"
@@ -23,7 +25,7 @@ const Key keys[] = {
 
 ModelRequest ModelRequest::Make(const std::string& path, const osgDB::Options* options)
 {
-    ModelRequest request{path, {}};
+    ModelRequest request{std::filesystem::absolute(path).lexically_normal().string(), {}};
     if (!options)
         return request;
     for (const Key& key : keys)

@@ -15,7 +15,7 @@ class Options;
 /// It goes to the reading process as command line arguments, and its text is what a finished model is kept under.
 struct ModelRequest
 {
-    std::string path; ///< as the file system takes it
+    std::string path; ///< complete, as the file system takes it
     std::map<std::string, std::string> options;
 
     /// The options of `options` that the reader knows; those that stand at the reader's own default are left out, so

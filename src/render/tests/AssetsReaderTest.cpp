@@ -126,6 +126,32 @@ TEST_F(AssetsReader, ASquareUsedTwiceStandsInBothPlaces)
     ExpectBox(Find(all, "right")->box, {0, 0, 0}, {2, 2, 0});
 }
 
+TEST_F(AssetsReader, AMirroredPartShowsItsFront)
+{
+    const auto node = Read(Write("m.dae", Dae({{{"as it is", "<scale>1 1 1</scale>", ""},
+                                                {"mirrored", "<scale>-1 1 1</scale>", ""},
+                                                {"mirrored twice", "<scale>-1 -1 1</scale>", ""}},
+                                               {},
+                                               "1",
+                                               "Y_UP",
+                                               {}})));
+    ASSERT_TRUE(node) << error;
+    const auto all = Geometries(*node);
+    ASSERT_EQ(all.size(), 3u);
+    for (const Placed& placed : all)
+    {
+        SCOPED_TRACE(placed.geode->getName());
+        const auto& vertices = dynamic_cast<const osg::Vec3Array&>(*placed.geometry->getVertexArray());
+        const osg::PrimitiveSet& set = *placed.geometry->getPrimitiveSet(0);
+        ASSERT_EQ(set.getNumIndices(), 6u);
+        for (unsigned i = 0; i < 6; i += 3)
+        {
+            const osg::Vec3 a = vertices[set.index(i)], b = vertices[set.index(i + 1)], c = vertices[set.index(i + 2)];
+            EXPECT_GT(((b - a) ^ (c - a)).z(), 0) << "it looks away";
+        }
+    }
+}
+
 TEST_F(AssetsReader, MaterialAndTextureStandOnTheDrawableWithDefaultsOnlyWhereTheFileIsSilent)
 {
     WritePicture("tex.png", 16);
@@ -361,6 +387,7 @@ TEST_F(AssetsReader, ABadFileGivesAReason)
          "contains itself"},
         {"nothing.dae", Dae({}), "no geometry"},
         {"other.wrl", "this is no VRML", "nothing"},
+        {"node.wrl", "#VRML V2.0 utf8\nShape { geometry Foo { } }", "``Foo'' not recognized. Occurred at line 2"},
         {"half.wrl", "#VRML V2.0 utf8\nGroup { children [", "middle of a node"},
         {"brackets.wrl", "#VRML V2.0 utf8\nGroup { children ] }", "brackets"},
         {"deep.wrl", deep, "nested too deeply"},

@@ -135,12 +135,9 @@ TEST_F(Views, LayoutsShareTheFrame)
         int activeAfter;
     };
     const Case cases[] = {
-        {commandTwoColumns, 2, {1, 2}, 402, 604, 2},
-        {commandTwoColumns, 3, {1, 2}, 402, 604, 1},
-        {commandTwoRows, 3, {1, 3}, 804, 302, 3},
-        {commandTwoRows, 4, {1, 3}, 804, 302, 1},
-        {commandFourViews, 4, {1, 2, 3, 4}, 402, 302, 4},
-        {commandSingleView, 3, {3}, 804, 604, 3},
+        {commandTwoColumns, 2, {1, 2}, 402, 604, 2},      {commandTwoColumns, 3, {1, 2}, 402, 604, 1},
+        {commandTwoRows, 3, {1, 3}, 804, 302, 3},         {commandTwoRows, 4, {1, 3}, 804, 302, 1},
+        {commandFourViews, 4, {1, 2, 3, 4}, 402, 302, 4}, {commandSingleView, 3, {3}, 804, 604, 3},
         {commandSingleView, 2, {2}, 804, 604, 2},
     };
     VtCVisualizationViewCommandsHandler commands(*frame);

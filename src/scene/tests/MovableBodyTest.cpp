@@ -70,28 +70,46 @@ TEST_F(MovableBody, AFramesMatrixMovesThePlacedModel)
 
     const osg::Matrixd byMatrix = body.GetTransform();
     body.SetLastTransformMatrix(osg::Matrixd());
-    body.SetLastTransformColumns(columns);
+    body.GetMotion().SetLastTransformColumns(columns);
     EXPECT_EQ(body.GetTransform(), byMatrix);
     EXPECT_EQ(body.GetLastTransformMatrix()(3, 3), 1.0);
 }
 
-TEST_F(MovableBody, TheShortProductIsTheWholeOne)
+TEST_F(MovableBody, TheQuickWayOfAFrameGivesTheWholeProduct)
 {
     std::mt19937 random(1);
-    std::uniform_real_distribution<double> number(-100, 100);
+    std::uniform_real_distribution<float> number(-100, 100);
+    const auto vector = [&] { return VtTFloatTupel3{number(random), number(random), number(random)}; };
     VtC3DMovableBody& body = AddMovable(L"Car");
     for (int round = 0; round < 200; ++round)
     {
-        Write(body, L"position", VtTFloatTupel3{float(number(random)), float(number(random)), float(number(random))});
-        Write(body, L"rotation", VtTFloatTupel3{float(number(random)), float(number(random)), float(number(random))});
+        Write(body, L"position", vector());
+        Write(body, L"rotation", vector());
+        Write(body, L"scale", vector());
+        float columns[16];
+        for (float& value : columns)
+            value = number(random);
+        const bool affine = round % 2 == 0;
+        if (affine)
+            columns[12] = columns[13] = columns[14] = 0;
+
         osg::Matrixd frame;
         for (int i = 0; i < 16; ++i)
-            frame.ptr()[i] = number(random);
-        if (round % 2 == 0)
-            frame.ptr()[3] = frame.ptr()[7] = frame.ptr()[11] = 0; // every other one is no affine map
-        body.SetLastTransformMatrix(frame);
+            frame(i % 4, i / 4) = columns[i];
         frame(3, 3) = 1;
-        EXPECT_EQ(body.GetTransform(), body.GetBaseMatrix() * frame);
+        const osg::Matrixd expected = body.GetBaseMatrix() * frame;
+        body.GetMotion().SetLastTransformColumns(columns);
+        EXPECT_EQ(body.GetTransform(), expected);
+        EXPECT_EQ(body.GetLastTransformMatrix(), frame);
+        body.SetLastTransformMatrix(osg::Matrixd());
+        body.SetLastTransformMatrix(frame);
+        EXPECT_EQ(body.GetTransform(), expected);
+        if (!affine)
+            continue;
+        body.SetLastTransformMatrix(osg::Matrixd());
+        MoveByColumnsPortable(body.GetMotion(), columns);
+        EXPECT_EQ(body.GetTransform(), expected);
+        EXPECT_EQ(body.GetLastTransformMatrix(), frame);
     }
 }
 
@@ -297,6 +315,20 @@ TEST_F(MovableGroup, PartsStandInTheGroupAndMoveByThemselves)
     document.channels.channels = {L"a", L"b"};
     truck.UpdateConnectionState();
     EXPECT_EQ(cab.GetConnectionState(), VtC3DMovableBody::connected);
+}
+
+TEST_F(MovableGroup, AFrameMovesItsPartsInItsPlace)
+{
+    VtC3DMovableBody& first = AddMovable(L"First");
+    VtC3DMovableBody& truck = AddTruck();
+    VtC3DMovableBody& last = AddMovable(L"Last");
+    const auto motion = [](const VtC3DMovableBody& body) { return &body.GetMotion(); };
+    VtCMovableBodies& all = *scene.GetMovableBodies(0);
+    EXPECT_EQ(all.GetMotions(), (std::vector<VtTBodyMotion*>{motion(first), motion(*truck.GetParts()[0]),
+                                                             motion(*truck.GetParts()[1]), motion(last)}));
+    truck.GetParts()[0]->Destroy();
+    first.Destroy();
+    EXPECT_EQ(all.GetMotions(), (std::vector<VtTBodyMotion*>{motion(*truck.GetParts()[0]), motion(last)}));
 }
 
 TEST_F(MovableGroup, EndsWithItsParts)

@@ -8,7 +8,7 @@ namespace SimulationDataPoints
 {
 
 VtCSimulationDataFrame::VtCSimulationDataFrame(std::shared_ptr<const VtTChannelDescription> layout)
-    : description(std::move(layout))
+    : description(std::move(layout)), poseCount(description->poses.size())
 {
     channels.reserve(description->ChannelCount());
     for (std::size_t pose = 0; pose < description->poses.size(); ++pose)

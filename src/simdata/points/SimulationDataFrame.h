@@ -5,12 +5,11 @@
 #include <memory>
 #include <vector>
 
+#include "simdata/points/ChannelDescription.h"
 #include "simdata/points/SimulationData.h"
 
 namespace SimulationDataPoints
 {
-
-struct VtTChannelDescription;
 
 /// One sample of all channels at one time.
 ///
@@ -27,6 +26,15 @@ public:
     VtCSimulationData* GetSimulationData(long index)
     {
         return index >= 0 && static_cast<std::size_t>(index) < channels.size() ? &channels[index] : nullptr;
+    }
+
+    /// The 16 floats of a pose where they lie, row by row as `GetMatrix4x4` gives them; null for an instrument stream
+    /// and when out of range. For who reads thousands of them in every frame.
+    const float* GetPose(long index) const
+    {
+        return index >= 0 && static_cast<std::size_t>(index) < poseCount
+                   ? reinterpret_cast<const float*>(record + description->PoseOffset(static_cast<std::size_t>(index)))
+                   : nullptr;
     }
 
     int GetCount() const { return static_cast<int>(channels.size()); }
@@ -76,6 +84,7 @@ private:
     }
 
     std::shared_ptr<const VtTChannelDescription> description;
+    std::size_t poseCount;
     std::vector<VtCSimulationData> channels;
     const std::byte* record = nullptr;
     double time = 0.0;

@@ -115,10 +115,10 @@ TEST_F(Controller, ChecksWhatRuns)
     };
     using enum VtEPlayState;
     const Case cases[] = {
-        {::playOnce, PlayOnce, 2, true},        {::playOnce, PlayOnce, 4, false},
-        {::playOnce, PlayLoop, 2, false},       {::playLoop, PlayLoop, 4, true},
-        {::playLoop, PlayOnce, 2, false},       {::spoolBack, SpoolBackward, 2, true},
-        {::spoolBack, SpoolForward, 2, false},  {::spoolForward, SpoolForward, 2, true},
+        {::playOnce, PlayOnce, 2, true},         {::playOnce, PlayOnce, 4, false},
+        {::playOnce, PlayLoop, 2, false},        {::playLoop, PlayLoop, 4, true},
+        {::playLoop, PlayOnce, 2, false},        {::spoolBack, SpoolBackward, 2, true},
+        {::spoolBack, SpoolForward, 2, false},   {::spoolForward, SpoolForward, 2, true},
         {::spoolForward, PlayStopped, 2, false},
     };
     for (const Case& c : cases)
@@ -145,8 +145,8 @@ TEST_F(Controller, EndsASpoolThatReachedTheEnd)
 
 TEST_F(Controller, DisablesEverythingWithoutConfigurationOrOnline)
 {
-    const std::uint32_t frameCommands[] = {start, store, refreshData, first,    previous,  next,        last,
-                                           video, playLoop, playOnce, stopPlay, spoolBack, spoolForward};
+    const std::uint32_t frameCommands[] = {start, store,    refreshData, first,    previous,  next,        last,
+                                           video, playLoop, playOnce,    stopPlay, spoolBack, spoolForward};
     live.SetRecent(2);
     live.path.clear();
     for (const std::uint32_t command : frameCommands)
@@ -239,7 +239,8 @@ TEST_F(Controller, PlaysOnceToTheLastFrameAndStops)
         clock.Advance(0.015);
     }
     // At 1.000, 1.015, 1.030 and, beyond the end, 1.045 s; afterwards nothing runs.
-    EXPECT_EQ(Taken(), (Log{"play Live 1", "frame 1 1", "frame 2 1.01", "frame 3 1.02", "frame 4 1.04", "play Live 0"}));
+    EXPECT_EQ(Taken(),
+              (Log{"play Live 1", "frame 1 1", "frame 2 1.01", "frame 3 1.02", "frame 4 1.04", "play Live 0"}));
     EXPECT_EQ(playing, (std::vector<bool>{true, true, true, false, false, false}));
     EXPECT_EQ(router.GetRecent(L"Live"), 4UL);
     EXPECT_FALSE(Enabled(playOnce));

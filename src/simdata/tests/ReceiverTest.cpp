@@ -223,8 +223,8 @@ TEST_F(Receiver, FeedsOlderInstrumentsFromTheLastTwoChannels)
     };
     // The channels 1 and 2 hold 100 and 200 plus ten times the row plus the column; three columns are counted.
     const Case cases[] = {
-        {1, 100, 0},  {2, 101, 0},   {5, 111, 0}, {12, 132, 0}, {13, 200, 0}, {14, 201, 1}, {24, 232, 32},
-        {25, 200, 0}, {26, 0.0, 0.0}, {0, 0, 0},   {-7, 0, 0},
+        {1, 100, 0},   {2, 101, 0},  {5, 111, 0},    {12, 132, 0}, {13, 200, 0}, {14, 201, 1},
+        {24, 232, 32}, {25, 200, 0}, {26, 0.0, 0.0}, {0, 0, 0},    {-7, 0, 0},
     };
     for (const Case& c : cases)
         instruments.Add(L"", c.stream);

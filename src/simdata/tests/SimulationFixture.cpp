@@ -119,7 +119,7 @@ Instrument& Instruments::Add(std::wstring signal, std::int32_t stream)
 
 VtTSimulationServices Services::Make(std::vector<std::wstring> pluginFolders)
 {
-    return {clock,     messages,  texts,          scene,          std::move(pluginFolders),
+    return {clock,      messages,  texts,          scene,          std::move(pluginFolders),
             &variables, &progress, &userInterface, &configuration, &questions};
 }
 

@@ -8,10 +8,10 @@
 
 #include "simdata/ActiveScene.h"
 #include "simdata/InstrumentFeed.h"
+#include "simdata/points/SimulationDataPoint.h"
 #include "simdata/SimulationDataChangeObject.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationServices.h"
-#include "simdata/points/SimulationDataPoint.h"
 #include "tests/support/FakeHost.h"
 
 /// What the tests of the simulation data path share: a source in the test's hands, a listener, a scene.
@@ -37,7 +37,6 @@ public:
 
     void Say(const std::wstring& text) { Messages().Add(SimulationDataPoints::VtEMessageSeverity::error, text); }
     using VtCSimulationDataPoint::AppendFrame;
-    using VtCSimulationDataPoint::GetKind;
     using VtCSimulationDataPoint::GetSimulationTime;
     using VtCSimulationDataPoint::StartBuffer;
 

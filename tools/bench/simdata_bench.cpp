@@ -13,9 +13,9 @@
 #include "scene/Scene3D.h"
 #include "simdata/ActiveScene.h"
 #include "simdata/ChannelLists.h"
-#include "simdata/SimulationDataReceiver.h"
 #include "simdata/points/SimulationDataFrames.h"
 #include "simdata/points/SimulationDataTracker.h"
+#include "simdata/SimulationDataReceiver.h"
 #include "tests/support/FakeScene.h"
 
 using namespace SimulationDataPoints;

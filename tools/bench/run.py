@@ -18,6 +18,9 @@ ROWS = {
     "load_mdf": ("loading a 200 MB .mdf", "read of the same bytes", 2.0),
     "idle_step_allocations": ("heap allocations in a steady idle step", "none", 0.0),
     "build_scene": ("scene of 1000 bodies over 10 models", "reading the 10 models once", 2.0),
+    "preload_models": ("10 models read at once", "one after another", 1.2),
+    "read_model": ("a model read in a process of its own", "library's reader in this process", 12.0),
+    "read_model_cached": ("a finished model taken from the cache", "library's reader in this process", 0.5),
 }
 
 

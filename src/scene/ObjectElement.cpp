@@ -1,0 +1,239 @@
+#include "scene/ObjectElement.h"
+
+#include "base/Numbers.h"
+#include "base/Text.h"
+#include "scene/RecordTables.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <limits>
+#include <optional>
+#include <utility>
+
+#include <pugixml.hpp>
+
+namespace
+{
+
+// Far above any record that somebody means; a text beyond them is a mistake or an attack on memory.
+constexpr std::size_t mostAttributes = 100000;
+constexpr std::size_t largestValue = 16U << 20; // bytes
+
+bool IsText(const pugi::xml_node& node)
+{
+    return node.type() == pugi::node_pcdata || node.type() == pugi::node_cdata;
+}
+
+std::int32_t ReadType(const pugi::xml_node& node, const pugi::xml_attribute& type)
+{
+    const std::optional<std::int64_t> number = base::ParseInteger(type.value());
+    if (!number || *number < 0 || *number > std::numeric_limits<std::int32_t>::max())
+        RefuseNode(node, "\"" + Shortened(type.value()) + "\" is not a type of objects");
+    return static_cast<std::int32_t>(*number);
+}
+
+// Text may be interrupted by comments and CDATA sections; together they are one text.
+std::wstring ReadText(const pugi::xml_node& element)
+{
+    std::string text;
+    for (const pugi::xml_node& part : element.children())
+        if (IsText(part))
+            text += part.value();
+        else if (IsElement(part))
+            RefuseContent(part);
+    if (text.size() > largestValue)
+        RefuseNode(element, "a value is larger than 16 MB");
+    return base::Wide(text);
+}
+
+VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const std::wstring& name)
+{
+    const pugi::xml_attribute told = node.attribute("type");
+    if (!told)
+        return AssumedAttributeType(name);
+    const VtEAttributeType type = AttributeTypeFromName(base::Wide(told.value()));
+    const std::optional<VtEAttributeType> fixed = FixedAttributeType(name);
+    if (fixed && *fixed != type)
+        throw VtCAttributeError("its type is " + base::Utf8(AttributeTypeName(*fixed)) + ", not " + told.value());
+    return type;
+}
+
+VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
+{
+    std::vector<std::wstring> values;
+    for (const pugi::xml_node& child : node.children())
+        if (IsElement(child) && std::string_view(child.name()) == "vtattr:value")
+            values.push_back(ReadText(child));
+        else if (IsElement(child) || IsLooseText(child))
+            RefuseContent(child);
+
+    if (type == VtEAttributeType::textList)
+        return values;
+    if (values.size() != 1)
+        throw VtCAttributeError("it has " + std::to_string(values.size()) + " values, not 1");
+    if (type == VtEAttributeType::text)
+        return std::move(values.front());
+    return AttributeValueFromText(type, values.front());
+}
+
+void ReadAttribute(const pugi::xml_node& node, VtISceneObject& object)
+{
+    const std::wstring name = base::Wide(node.attribute("name").value());
+    if (name.empty())
+        RefuseNode(node, "an attribute has no name");
+    if (object.GetAttribute(name))
+        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\" is there twice");
+    if (object.GetAttributes().size() >= mostAttributes)
+        RefuseNode(node, "more than " + std::to_string(mostAttributes) + " attributes");
+    try
+    {
+        VtTAttributeValue value = ReadValue(node, ReadAttributeType(node, name));
+        const auto* list = std::get_if<std::vector<float>>(&value);
+        const std::optional<std::size_t> length = list ? FixedListLength(name) : std::nullopt;
+        if (length && list->size() != *length)
+            throw VtCAttributeError("it holds " + std::to_string(list->size()) + " numbers, not " +
+                                    std::to_string(*length));
+        object.AddAttribute(name, std::move(value));
+    }
+    catch (const VtCAttributeError& error)
+    {
+        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\": " + error.what());
+    }
+}
+
+void ReadAttributes(const pugi::xml_node& parent, VtISceneObject& object)
+{
+    for (const pugi::xml_node& node : parent.children())
+        if (IsElement(node) && std::string_view(node.name()) == "vtattr:Attribute")
+            ReadAttribute(node, object);
+        else if (IsElement(node) || IsLooseText(node))
+            RefuseContent(node);
+}
+
+// A carriage return stays one only as a reference: readers of XML make a line end of it. So do line ends in quotes.
+void AppendEscaped(std::string& text, std::wstring_view value, bool inQuotes)
+{
+    for (const char c : base::Utf8(value))
+        switch (c)
+        {
+        case '&':
+            text += "&amp;";
+            break;
+        case '<':
+            text += "&lt;";
+            break;
+        case '>':
+            text += "&gt;";
+            break;
+        case '"':
+            text += inQuotes ? "&quot;" : "\"";
+            break;
+        case '\0':
+            text += "\xEF\xBF\xBD";
+            break;
+        default:
+            if (static_cast<unsigned char>(c) < 0x20 && (inQuotes || (c != '\t' && c != '\n')))
+                text += "&#" + std::to_string(static_cast<int>(c)) + ';';
+            else
+                text += c;
+        }
+}
+
+void AppendValue(std::string& text, std::wstring_view value)
+{
+    text += "<vtattr:value>";
+    AppendEscaped(text, value, false);
+    text += "</vtattr:value>";
+}
+
+} // namespace
+
+bool IsElement(const pugi::xml_node& node)
+{
+    return node.type() == pugi::node_element;
+}
+
+bool IsLooseText(const pugi::xml_node& node)
+{
+    return IsText(node) && !base::Trim(node.value()).empty();
+}
+
+std::string Shortened(const char* text)
+{
+    constexpr std::size_t longest = 60;
+    const std::string_view whole(text);
+    return base::Utf8(base::Wide(whole.substr(0, longest))) + (whole.size() > longest ? "..." : "");
+}
+
+void RefuseNode(const pugi::xml_node& node, const std::string& reason)
+{
+    throw VtTTextFault{node.offset_debug(), reason};
+}
+
+void RefuseContent(const pugi::xml_node& node)
+{
+    if (IsElement(node))
+        RefuseNode(node, "element <" + Shortened(node.name()) + "> is not expected here");
+    RefuseNode(node, "text \"" + Shortened(node.value()) + "\" is not expected here");
+}
+
+void RefuseDocumentTypes(const pugi::xml_node& document)
+{
+    for (const pugi::xml_node& node : document.children())
+        if (node.type() == pugi::node_doctype)
+            throw VtTTextFault{0, "a document type is not allowed"};
+}
+
+osg::ref_ptr<VtISceneObject> ReadObjectElement(const pugi::xml_node& element, const pugi::xml_node& parent,
+                                               bool isWhole)
+{
+    osg::ref_ptr<VtISceneObject> object = new VtISceneObject;
+    std::optional<std::int32_t> type;
+    if (const pugi::xml_attribute told = element.attribute("type"))
+        type = ReadType(element, told);
+    ReadAttributes(parent, *object);
+
+    if (isWhole && object->GetAttributes().empty())
+        RefuseNode(element, "the object has no attributes");
+    const std::int32_t* stored = object->Find<std::int32_t>(L"object_type");
+    if (type && stored && *type != *stored)
+        RefuseNode(element, "the type of the object is " + std::to_string(*type) + ", but its object_type is " +
+                                std::to_string(*stored));
+    if (!type && !stored && isWhole)
+        RefuseNode(element, "the object has no type");
+    object->SetObjectType(type ? *type : stored ? *stored : std::int32_t{objectTypeStaticBody});
+    object->Write(L"object_type", object->GetObjectType());
+    return object;
+}
+
+void WriteObjectElement(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace)
+{
+    text.append(indent, ' ') += "<vtattr:Object";
+    if (declaresNamespace)
+        (text += " xmlns:vtattr=\"") += attributesNamespace + std::string("\"");
+    text += " type=\"" + std::to_string(object.GetObjectType()) + "\">\n";
+    for (const osg::ref_ptr<VtISceneAttribute>& attribute : object.GetAttributes())
+    {
+        text.append(indent + 2, ' ') += "<vtattr:Attribute name=\"";
+        AppendEscaped(text, attribute->GetName(), true);
+        text += "\" type=\"" + base::Utf8(attribute->GetTypeName()) + "\">";
+        if (const auto* texts = std::get_if<std::vector<std::wstring>>(&attribute->GetValue()))
+            for (const std::wstring& value : *texts)
+                AppendValue(text, value);
+        else
+            AppendValue(text, attribute->GetValueText());
+        text += "</vtattr:Attribute>\n";
+    }
+    text.append(indent, ' ') += "</vtattr:Object>\n";
+}
+
+std::ptrdiff_t LineOf(std::ptrdiff_t offset, std::string_view text)
+{
+    const std::size_t end = std::min(static_cast<std::size_t>(std::max<std::ptrdiff_t>(offset, 0)), text.size());
+    return 1 + std::count(text.begin(), text.begin() + static_cast<std::ptrdiff_t>(end), '\n');
+}
+
+std::string DescribeFault(const VtTTextFault& fault, std::string_view text)
+{
+    return "line " + std::to_string(LineOf(fault.offset, text)) + ": " + fault.reason;
+}

@@ -1,0 +1,57 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+#include <osg/ref_ptr>
+
+#include "scene/SceneObject.h"
+
+namespace pugi
+{
+class xml_node;
+}
+
+/// One record as an XML element, as texts of single records and scene files share it. Inside this folder only.
+
+/// What is wrong with a text, at a byte of it. Thrown by the functions that read.
+struct VtTTextFault
+{
+    std::ptrdiff_t offset;
+    std::string reason;
+};
+
+constexpr const char* attributesNamespace = "urn:panoramic:attributes";
+constexpr const char* objectElementName = "vtattr:Object";
+
+[[noreturn]] void RefuseNode(const pugi::xml_node& node, const std::string& reason);
+
+/// Refuses `node` as an element or a text that has no place where it stands.
+[[noreturn]] void RefuseContent(const pugi::xml_node& node);
+
+bool IsElement(const pugi::xml_node& node);
+
+/// A text that holds more than blanks and line ends.
+bool IsLooseText(const pugi::xml_node& node);
+
+/// Refuses document types: entities of a text's own are never expanded.
+void RefuseDocumentTypes(const pugi::xml_node& document);
+
+/// The first bytes of a text from outside, for a message.
+std::string Shortened(const char* text);
+
+/// The record whose attributes stand below `parent`. `element` is the `vtattr:Object` with its type, null for
+/// attributes without one. Without a type it is one of a static body; with
+/// `isWhole` it is refused, and so is a record without attributes.
+osg::ref_ptr<VtISceneObject> ReadObjectElement(const pugi::xml_node& element, const pugi::xml_node& parent,
+                                               bool isWhole);
+
+/// Appends the element of `object`, indented by `indent` blanks, with the declaration of the namespace if asked for.
+void WriteObjectElement(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace);
+
+/// The line of a byte of `text`, counted from 1.
+std::ptrdiff_t LineOf(std::ptrdiff_t offset, std::string_view text);
+
+/// "line 3: reason" for a fault in `text`.
+std::string DescribeFault(const VtTTextFault& fault, std::string_view text);
