@@ -1,6 +1,7 @@
 #include "app/FrameCycle.h"
 
 #include <cmath>
+#include <iterator>
 
 #include <fmt/format.h>
 #include <fmt/xchar.h>
@@ -92,7 +93,9 @@ void VtCFrameCycle::UpdateFrameRateDisplay()
     const float frameRate = static_cast<float>(work.GetFrameRate());
     if (!(std::fabs(frameRate - lastFrameRate) > frameRateHysteresis))
         return;
-    SetFrameRateText(fmt::format(L"{:04.1f}", frameRate));
+    frameRateText.clear(); // keeps its memory: a steady pass takes none
+    fmt::format_to(std::back_inserter(frameRateText), L"{:04.1f}", frameRate);
+    SetFrameRateText(frameRateText);
     lastFrameRate = frameRate;
 }
 

@@ -95,6 +95,7 @@ private:
     std::int64_t retryStart = 0;    ///< counter at the last retry; 0 not taken yet
     std::int32_t frameCounter = 0;
     float lastFrameRate = 0.0F; ///< as last published
+    std::wstring frameRateText;
     bool redrawAllowed = true;
     bool idleSinkConnected = false;
     std::uint32_t idleCookie = 0;
