@@ -79,6 +79,7 @@ public:
     host::Settings* GetSettings() override { return &settings; }
     host::Questions* GetQuestions() override { return &questions; }
     host::Graphics* GetGraphics() override { return &graphics; }
+    host::ViewWindows* GetViewWindows() override { return nullptr; }
 
     hosts::IdleLoop& GetIdleLoop() { return loop; }
     ConsoleMessages& GetMessages() { return messages; }

@@ -16,6 +16,9 @@
 #include "host/Progress.h"
 #include "host/Storage.h"
 #include "render/AssetManager.h"
+#include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
+#include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneObjectStore.h"
@@ -107,6 +110,11 @@ void VtCPanoramicApp::ConnectViewer()
     services.disconnectIdle = [this] { DisconnectIdleSink(); };
     services.connectIdle = [this] { ConnectIdleSink(); };
     services.hasScene = [this] { return IsSceneLoaded(); };
+    services.activeView = [this]() -> osgViewer::View*
+    {
+        const VtCPanoramicView* view = GetActiveView();
+        return view ? view->getView() : nullptr;
+    };
     setViewerServices(std::move(services));
 }
 
@@ -241,7 +249,9 @@ void VtCPanoramicApp::StopSimulation()
 
 void VtCPanoramicApp::RenderCurrentView()
 {
-    if (VtCScene3D* scene = GetActiveScene())
+    const VtCPanoramicView* view = GetActiveView();
+    VtCScene3D* scene = view ? view->GetDocument().GetScene() : nullptr;
+    if (scene)
         scene->UpdateFrame();
 }
 
@@ -254,6 +264,30 @@ VtCScene3D* VtCPanoramicApp::GetActiveScene() const
 {
     const VtCPanoramicDocument* document = GetActiveDocument();
     return document ? document->GetScene() : nullptr;
+}
+
+VtCPanoramicView* VtCPanoramicApp::GetActiveView() const
+{
+    const VtCPanoramicDocument* document = GetActiveDocument();
+    const VtCChildFrame* frame = document ? document->GetChildFrame() : nullptr;
+    return frame ? frame->GetActiveView() : nullptr;
+}
+
+bool VtCPanoramicApp::OnCmdMsg(std::uint32_t command)
+{
+    const VtCPanoramicDocument* document = GetActiveDocument();
+    if (document && document->GetChildFrame() && document->GetChildFrame()->getCommands().Execute(command))
+        return true;
+    return controller && controller->OnCmdMsg(command);
+}
+
+std::optional<VtTMenuState> VtCPanoramicApp::GetMenuState(std::uint32_t command) const
+{
+    const VtCPanoramicDocument* document = GetActiveDocument();
+    VtTMenuState state;
+    if (document && document->GetChildFrame() && document->GetChildFrame()->getCommands().GetState(command, state))
+        return state;
+    return controller ? controller->GetMenuState(command) : std::nullopt;
 }
 
 VtIInstrumentFeed* VtCPanoramicApp::GetActiveInstruments() const

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -23,8 +24,10 @@ class UserInterface;
 
 class VtCGlidePanelToolBarEventsSink;
 class VtCPanoramicDocument;
+class VtCPanoramicView;
 class VtCSceneObjectStore;
 class VtCSimulationDataController;
+struct VtTMenuState;
 struct VtTSceneServices;
 
 /// The application object: what the host drives, and what everything outermost reaches the others by.
@@ -80,14 +83,26 @@ public:
     /// Does an active document hold a scene?
     bool IsSceneLoaded() const override { return GetActiveScene() != nullptr; }
 
-    /// Prepares the active scene for a frame: its observers go where their bodies are now.
+    /// Prepares the scene of the active view for a frame: its observers go where their bodies are now.
     void RenderCurrentView() override;
+
+    // Commands, by the numbers of menus and tool bars
+
+    /// Carries the command out if it is enabled: the views' of the active document, then the controller's. False for a
+    /// number that is neither's.
+    bool OnCmdMsg(std::uint32_t command);
+
+    /// How the command shows; nothing for a number that is neither's.
+    std::optional<VtTMenuState> GetMenuState(std::uint32_t command) const;
 
     // What others ask for
 
     /// Null while there is none, and for a document of another kind.
     VtCPanoramicDocument* GetActiveDocument() const;
     VtCScene3D* GetActiveScene() const override;
+
+    /// The view that has the focus in the active document; null in a host without windows for views.
+    VtCPanoramicView* GetActiveView() const;
     VtIInstrumentFeed* GetActiveInstruments() const override;
 
     /// Null before `StartupCompleted` and after `StartShutdown`.

@@ -3,12 +3,20 @@
 #include <filesystem>
 #include <system_error>
 
+#include "app/DayLight.h"
 #include "app/GraphicsSession.h"
 #include "app/PanoramicApp.h"
 #include "base/Paths.h"
 #include "base/Text.h"
+#include "host/Host.h"
+#include "host/ViewWindows.h"
+#include "interaction/MouseInput.h"
+#include "interaction/Observers.h"
+#include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
+#include "scene/SceneObject.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationDataReceiver.h"
 
@@ -16,7 +24,15 @@ namespace
 {
 
 constexpr std::uint32_t messageNoScene = 417;          // %1 the file, if it was one
-constexpr std::uint32_t messageSceneNotReadable = 496; // %1 the file
+constexpr std::uint32_t messageSceneNotReadable = 496; // %1 the file, %2 the reason
+constexpr std::uint32_t messageSaved = 524;            // %1 the file
+constexpr std::uint32_t messageNotSaved = 525;         // %1 the file, %2 the reason
+constexpr std::uint32_t textOtherFileType = 9014;      // why a file of another extension can't be read
+
+std::wstring Shown(const std::wstring& path)
+{
+    return base::Wide(base::NativePath(path).string());
+}
 
 } // namespace
 
@@ -25,44 +41,139 @@ VtCPanoramicDocument::VtCPanoramicDocument(VtCPanoramicApp& application) : app(a
     if (!graphicsSession)
         graphicsSession = std::make_unique<VtCGraphicsSession>();
     ownedScene = std::make_unique<VtCScene3D>(*this);
+    AddDayLight(*scene->GetEnvironmentNode());
+
+    observers = new VtC3DObservers(*this, *this, app.GetHost().GetClock(),
+                                   base::NativePath(app.GetModuleDirectory() + std::wstring(defaultObserversFile)));
+    observers->CreateFreeObservers();
+    scene->SetObservers(observers);
+
     receiver = std::make_unique<VtCSimulationDataReceiver>(app);
     if (VtCSimulationDataController* controller = app.GetController())
         controller->GetRouter().AddReceiver(receiver.get());
+
+    mouseInputManager = std::make_unique<VtCMouseInputManager>();
+    MakeChildFrame();
+    SetModifiedFlag(false);
 }
 
 VtCPanoramicDocument::~VtCPanoramicDocument()
 {
+    childFrame.reset();
     if (VtCSimulationDataController* controller = app.GetController())
         controller->GetRouter().RemoveReceiver(receiver.get());
     receiver.reset();
+    scene->SetObservers(nullptr);
+    observers->Release();
     ownedScene.reset();
     destroyViewer();
 }
 
+void VtCPanoramicDocument::MakeChildFrame()
+{
+    host::ViewWindows* windows = app.GetHost().GetViewWindows();
+    if (!windows)
+        return;
+    childFrame =
+        std::make_unique<VtCChildFrame>(VtTChildFrameServices{.document = *this,
+                                                              .observers = *observers,
+                                                              .interaction = *this,
+                                                              .mouseInputManager = *mouseInputManager,
+                                                              .windows = *windows,
+                                                              .clock = app.GetHost().GetClock(),
+                                                              .disconnectIdle = [this] { app.DisconnectIdleSink(); },
+                                                              .connectIdle = [this] { app.ConnectIdleSink(); }});
+}
+
 bool VtCPanoramicDocument::OnNewDocument()
 {
-    if (app.CanOpenScene())
-        return true;
-    app.GetMessageHandler().ShowWarning(messageNoScene);
-    return false;
+    if (!app.CanOpenScene())
+    {
+        app.GetMessageHandler().ShowWarning(messageNoScene);
+        return false;
+    }
+    if (childFrame)
+        childFrame->startViewCreation();
+    return true;
 }
 
 bool VtCPanoramicDocument::OnOpenDocument(const std::wstring& path)
 {
     const std::filesystem::path file = base::NativePath(path);
-    const std::wstring shown = base::Wide(file.string());
     std::error_code failed;
     if (!std::filesystem::is_regular_file(file, failed) || !app.CanOpenScene())
     {
-        app.GetMessageHandler().ShowWarning(messageNoScene, shown);
+        app.GetMessageHandler().ShowWarning(messageNoScene, Shown(path));
         return false;
     }
-    // There is no reader of scene files in this component, so no file can be taken as one.
-    app.GetMessageHandler().ShowError(messageSceneNotReadable, shown);
+    std::wstring reason;
+    if (!LoadScene(path, reason))
+    {
+        app.GetMessageHandler().ShowError(messageSceneNotReadable, Shown(path), reason);
+        return false;
+    }
+    scene->ResolveObserverTargets();
+    SetModifiedFlag(false);
+    if (childFrame)
+        childFrame->startViewCreation();
+    return true;
+}
+
+bool VtCPanoramicDocument::LoadScene(const std::wstring& path, std::wstring& reason)
+{
+    if (!base::EqualsNoCase(base::Wide(base::NativePath(path).extension().string()), L".xml"))
+    {
+        reason = app.GetHost().GetTexts().GetText(textOtherFileType);
+        return false;
+    }
+    try
+    {
+        if (scene->LoadSceneFile(path, false))
+            return true;
+        reason = scene->GetFileError();
+    }
+    catch (const VtCAttributeError& error)
+    {
+        reason = base::Wide(error.what());
+    }
+    return false;
+}
+
+bool VtCPanoramicDocument::OnSaveDocument(const std::wstring& path)
+{
+    if (scene->SaveScene(path))
+    {
+        app.GetMessageHandler().Log(messageSaved, Shown(path));
+        return true;
+    }
+    app.GetMessageHandler().ShowError(messageNotSaved, Shown(path), scene->GetFileError());
     return false;
 }
 
 VtTSceneServices& VtCPanoramicDocument::GetServices()
 {
     return app.GetSceneServices();
+}
+
+std::uint32_t VtCPanoramicDocument::GetMouseSensitivity() const
+{
+    return app.GetMouseSensitivity();
+}
+
+bool VtCPanoramicDocument::IsActiveView(const osgViewer::View* view) const
+{
+    const VtCPanoramicView* active = childFrame ? childFrame->GetActiveView() : nullptr;
+    return active && view && active->getView() == view;
+}
+
+const VtC3DObserver* VtCPanoramicDocument::GetActiveObserver() const
+{
+    const VtCPanoramicView* active = childFrame ? childFrame->GetActiveView() : nullptr;
+    return active ? active->getObserver() : nullptr;
+}
+
+void VtCPanoramicDocument::ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver& substitute)
+{
+    if (childFrame)
+        childFrame->assignObserver(gone, substitute);
 }

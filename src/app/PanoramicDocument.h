@@ -4,37 +4,66 @@
 #include <string>
 
 #include "host/Documents.h"
+#include "interaction/InteractionServices.h"
 #include "scene/SceneServices.h"
 
+class VtC3DObservers;
+class VtCChildFrame;
+class VtCMouseInputManager;
 class VtCPanoramicApp;
 class VtCSimulationDataReceiver;
 
-/// A document: one scene, and the receiver by which simulation data get to it. The host's document manager owns it.
+/// A document: one scene with its observers and its frame of views, and the receiver by which simulation data get to
+/// it. The host's document manager owns it.
 ///
 /// A new one has an empty scene. A different scene is a different document.
-class VtCPanoramicDocument : public host::ManagedDocument, public VtISceneDocument
+class VtCPanoramicDocument : public host::ManagedDocument, public VtISceneDocument, private VtIInteractionServices
 {
 public:
+    /// File beside the program with the observers that a new model is given.
+    static constexpr const wchar_t* defaultObserversFile = L"DefaultObservers.ini";
+
     /// Sets the scene graph library up if this is the first document. `application` outlives this.
     explicit VtCPanoramicDocument(VtCPanoramicApp& application);
 
-    /// The scene goes, and the viewer with all its views.
+    /// Views, observers and scene go, and the viewer.
     ~VtCPanoramicDocument() override;
 
     /// False with warning 417 when no scene can be shown on this machine.
     bool OnNewDocument() override;
 
-    /// False with warning 417 also when there is no such file, and with error 496 when it can't be read as a scene.
+    /// Loads a scene file; the views are drawn to when their creation timer has fired. False with warning 417 when
+    /// there is no such file or no scene can be shown, and with error 496 when it can't be read as a scene.
     bool OnOpenDocument(const std::wstring& path) override;
+
+    /// Writes the scene file, whole or not at all. False with error 525, the document then being as modified as it was.
+    bool OnSaveDocument(const std::wstring& path) override;
 
     VtCScene3D* GetScene() const override { return scene; }
     void SetScene(VtCScene3D* newScene) override { scene = newScene; }
     void SetModified(bool flag) override { SetModifiedFlag(flag); }
     VtTSceneServices& GetServices() override;
 
+    VtC3DObservers& GetObservers() const { return *observers; }
+
+    /// Null in a host without windows for views.
+    VtCChildFrame* GetChildFrame() const { return childFrame.get(); }
+
 private:
+    std::uint32_t GetMouseSensitivity() const override;
+    bool IsActiveView(const osgViewer::View* view) const override;
+    const VtC3DObserver* GetActiveObserver() const override;
+    void SetHeadLightPosition(const osg::Vec3f&) override {} // the head light stands at the eye of each view
+    void ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver& substitute) override;
+
+    void MakeChildFrame();
+    bool LoadScene(const std::wstring& path, std::wstring& reason);
+
     VtCPanoramicApp& app;
     VtCScene3D* scene = nullptr; ///< set by the scene's own constructor, before it is whole
     std::unique_ptr<VtCScene3D> ownedScene;
+    VtC3DObservers* observers = nullptr; ///< one reference
+    std::unique_ptr<VtCMouseInputManager> mouseInputManager;
+    std::unique_ptr<VtCChildFrame> childFrame;
     std::unique_ptr<VtCSimulationDataReceiver> receiver;
 };

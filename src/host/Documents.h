@@ -20,6 +20,9 @@ public:
     /// Called once on a new document that is to be read from `path` (inner form); false refuses it.
     virtual bool OnOpenDocument(const std::wstring& path) = 0;
 
+    /// Writes the document to `path` (inner form); false, after a message, when that failed.
+    virtual bool OnSaveDocument(const std::wstring& path) = 0;
+
     virtual void OnCloseDocument() {}
 
     virtual void SetModifiedFlag(bool flag) { modified = flag; }

@@ -16,6 +16,7 @@ class Settings;
 class Texts;
 class UserInterface;
 class Variables;
+class ViewWindows;
 
 /// The program around the component, as the application object is given it.
 ///
@@ -40,6 +41,7 @@ public:
     virtual Settings* GetSettings() = 0;
     virtual Questions* GetQuestions() = 0;
     virtual Graphics* GetGraphics() = 0;
+    virtual ViewWindows* GetViewWindows() = 0;
 };
 
 } // namespace host

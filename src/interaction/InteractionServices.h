@@ -10,7 +10,7 @@ class View;
 }
 class VtC3DObserver;
 
-/// What observers and manipulators ask of the layers above them. The application object implements it.
+/// What observers and manipulators ask of the layers above them. The document implements it.
 class VtIInteractionServices
 {
 public:

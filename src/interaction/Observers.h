@@ -60,8 +60,7 @@ public:
     std::vector<VtTMissingTarget> GetMissingTargets() const override;
     void SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody& body) override;
 
-    /// Forgets the followed rotations of an earlier run.
-    void ClearFollowers();
+    void ClearFollowers() override;
 
     const std::vector<std::wstring>& GetFollowModeNames() const { return followModeNames; }
 

@@ -19,6 +19,11 @@ VtCBase3DView::~VtCBase3DView()
         observer->Release();
 }
 
+VtISceneDocument& VtCBase3DView::GetDocument() const
+{
+    return frame.GetDocument();
+}
+
 void VtCBase3DView::attachView(osgViewer::View* newView)
 {
     if (newView)

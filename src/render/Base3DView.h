@@ -11,6 +11,7 @@
 
 class VtC3DObserver;
 class VtCOsgCameramanipulator;
+class VtISceneDocument;
 class VtIViewFrame;
 
 /// Everything about a view of the scene except its window: camera, viewport, projection, observer.
@@ -30,6 +31,8 @@ public:
     /// Pane number, 1 to 4.
     virtual void setViewPosition(std::int32_t position) { viewPosition = position; }
     std::int32_t getViewPosition() const { return viewPosition; }
+
+    VtISceneDocument& GetDocument() const;
 
     /// Null is ignored.
     void attachView(osgViewer::View* newView);

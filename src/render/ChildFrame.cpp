@@ -8,6 +8,7 @@
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
 #include "render/PanoramicView.h"
+#include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
 #include "scene/Body.h"
 #include "scene/Scene3D.h"
@@ -30,7 +31,9 @@ void Tell(const std::function<void()>& function)
 } // namespace
 
 VtCChildFrame::VtCChildFrame(VtTChildFrameServices frameServices)
-    : services(std::move(frameServices)), window(services.windows.MakeChildFrame())
+    : services(std::move(frameServices)),
+      commands(std::make_unique<VtCVisualizationViewCommandsHandler>(*this)),
+      window(services.windows.MakeChildFrame())
 {
     renderingEnabled = false;
     Pause();
@@ -84,6 +87,11 @@ void VtCChildFrame::CreateViews()
             const VtISceneObject* record = view.getSceneObject();
             if (const auto* name = record ? record->Find<std::wstring>(L"observer") : nullptr)
                 view.assignObserverByName(std::wstring(*name));
+            // A new view begins with clip planes of its own; those of a loaded record are the user's.
+            if (const auto* nearPlane = record ? record->Find<float>(L"front_clip_plane") : nullptr)
+                view.setNearClipPlane(*nearPlane);
+            if (const auto* farPlane = record ? record->Find<float>(L"back_clip_plane") : nullptr)
+                view.setFarClipPlane(*farPlane);
         });
     viewsCreated = true;
     renderEmptyFrame(false);

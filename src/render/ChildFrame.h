@@ -14,6 +14,7 @@ class Clock;
 class ViewWindows;
 } // namespace host
 class VtCMouseInputManager;
+class VtCVisualizationViewCommandsHandler;
 
 /// What a child frame needs of the application.
 struct VtTChildFrameServices
@@ -42,6 +43,7 @@ public:
 
     VtCSplitterEx& getSplitter() const { return *splitter; }
     host::ChildFrameWindow& getWindow() const { return *window; }
+    VtCVisualizationViewCommandsHandler& getCommands() const { return *commands; }
 
     /// Starts the timer that makes the four views, 250 milliseconds from now.
     void startViewCreation();
@@ -82,6 +84,7 @@ private:
     void Pause() const;
 
     VtTChildFrameServices services;
+    std::unique_ptr<VtCVisualizationViewCommandsHandler> commands;
     std::unique_ptr<host::ChildFrameWindow> window;
     VtCPanoramicView* activeView = nullptr;
     std::unique_ptr<VtCSplitterEx> splitter;

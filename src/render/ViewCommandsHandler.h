@@ -2,6 +2,8 @@
 
 #include <cstdint>
 
+#include "host/CommandState.h"
+
 class VtCChildFrame;
 class VtCScene3D;
 class VtIViewFrame;
@@ -22,13 +24,6 @@ enum VtEViewCommand : std::uint32_t
     commandFileClose = 57602,
     commandFileSave = 57603,
     commandFileSaveAs = 57604,
-};
-
-/// What a menu shows of a command.
-struct VtTCommandState
-{
-    bool enabled = false;
-    bool checked = false;
 };
 
 /// Carries out the commands of the views and tells their states.

@@ -90,6 +90,9 @@ public:
     /// Moves every observer to where its body is now, in collection order.
     virtual void UpdateObservers() = 0;
 
+    /// A live run begins: what was remembered of an earlier one is forgotten.
+    virtual void ClearFollowers() {}
+
     /// `body` is about to go: observers that ride on it stay where they are, not connected.
     virtual void ReleaseBody(VtC3DMovableBody& body) = 0;
 

@@ -1,7 +1,8 @@
 #pragma once
 
 #include <cstdint>
-#include <string>
+
+#include "host/CommandState.h"
 
 /// Command numbers of the menus and tool bars that the simulation data controller answers.
 namespace ControllerCommand
@@ -28,15 +29,3 @@ inline constexpr std::uint32_t spoolBack = 38752;
 inline constexpr std::uint32_t spoolForward = 38753;
 inline constexpr std::uint32_t videoConfiguration = 38900;
 } // namespace ControllerCommand
-
-struct VtTCommandState
-{
-    bool enabled = false;
-    bool checked = false;
-};
-
-/// How a command shows in a menu.
-struct VtTMenuState : VtTCommandState
-{
-    std::wstring text; ///< empty: the menu's own
-};

@@ -4,6 +4,9 @@
 
 #include "base/Text.h"
 #include "host/Storage.h"
+#include "scene/Scene3D.h"
+#include "scene/SceneServices.h"
+#include "simdata/ActiveScene.h"
 #include "simdata/SimulationDataChangeObject.h"
 
 namespace
@@ -42,6 +45,9 @@ void VtCSimulationDataController::Start()
         return;
     SetMode(VtESimulationMode::Online);
     UpdateRunningIndicator();
+    const VtCScene3D* scene = services.activeScene.GetActiveScene();
+    if (VtISceneObservers* observers = scene ? scene->GetSceneObservers() : nullptr)
+        observers->ClearFollowers();
 }
 
 void VtCSimulationDataController::Stop()

@@ -315,6 +315,7 @@ public:
     host::Settings* GetSettings() override { return &settings; }
     host::Questions* GetQuestions() override { return &questions; }
     host::Graphics* GetGraphics() override { return graphics; }
+    host::ViewWindows* GetViewWindows() override { return viewWindows; }
 
     Clock clock;
     Texts texts;
@@ -333,7 +334,8 @@ public:
     host::Variables* variablesService = &variables;
     host::Progress* progressService = &progress;
     host::Configuration* configurationService = &configuration;
-    host::Graphics* graphics = nullptr; ///< none unless a test draws
+    host::Graphics* graphics = nullptr;       ///< none unless a test draws
+    host::ViewWindows* viewWindows = nullptr; ///< none unless a test has panes
 };
 
 } // namespace fake

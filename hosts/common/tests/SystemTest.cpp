@@ -171,6 +171,7 @@ struct Document : host::ManagedDocument
     ~Document() override { log += "gone "; }
     bool OnNewDocument() override { return accepts; }
     bool OnOpenDocument(const std::wstring&) override { return accepts; }
+    bool OnSaveDocument(const std::wstring&) override { return accepts; }
     void OnCloseDocument() override { log += "closed "; }
 
     static inline bool accepts = true;

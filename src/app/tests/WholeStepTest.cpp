@@ -8,6 +8,7 @@
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
+#include "tests/support/FakeViews.h"
 #include "tests/support/HeapCount.h"
 
 namespace
@@ -33,6 +34,7 @@ struct WholeStep : AppFixture
     /// A scene with one body that follows the channel "Car".
     VtC3DMovableBody& StartWithBody()
     {
+        host.viewWindows = &windows; // only a scene with an active view has its observers moved
         Start();
         document = NewDocument();
         AddPoint({0.0, 1.0, 2.0, 3.0});
@@ -43,6 +45,7 @@ struct WholeStep : AppFixture
     }
 
     VtCPanoramicDocument* document = nullptr;
+    fake::ViewWindows windows;
 };
 
 TEST_F(WholeStep, BodiesMoveBeforeTheObserversAndThePictureComesLast)
