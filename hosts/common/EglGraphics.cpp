@@ -9,6 +9,7 @@
 #include "base/Text.h"
 #include "hosts/common/EglContext.h"
 #include "hosts/common/EglDisplay.h"
+#include "hosts/common/OffscreenWindow.h"
 
 namespace hosts
 {
@@ -80,7 +81,8 @@ std::string SizeText(int width, int height)
 
 } // namespace
 
-osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsContext::Traits& traits, host::Window&)
+osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsContext::Traits& traits,
+                                                              host::Window& window)
 {
     std::string error;
     const EglDisplay* display = EglDisplay::Open(error);
@@ -103,8 +105,11 @@ osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsConte
         return Fail("the driver (" + display->GetName() + ") has no off-screen surface with the colours, depth and " +
                     "stencil that are needed");
 
-    const int width = std::max(1, traits.width);
-    const int height = std::max(1, traits.height);
+    // The root context, which shares with nobody, is never drawn to.
+    const auto* surfaceOwner = sharedContext == EGL_NO_CONTEXT ? nullptr : dynamic_cast<OffscreenSurface*>(&window);
+    const host::Rectangle largest = surfaceOwner ? surfaceOwner->GetSurfaceRectangle() : host::Rectangle();
+    const int width = std::max({1, traits.width, largest.width});
+    const int height = std::max({1, traits.height, largest.height});
     const EGLint widest = Attribute(egl, *config, EGL_MAX_PBUFFER_WIDTH);
     const EGLint highest = Attribute(egl, *config, EGL_MAX_PBUFFER_HEIGHT);
     if (width > widest || height > highest)

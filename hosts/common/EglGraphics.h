@@ -9,7 +9,8 @@ namespace hosts
 
 /// Contexts that draw off-screen by EGL: no display server, no window system, a graphics card if there is one.
 ///
-/// Every context draws to a pbuffer of the size in its traits (1 x 1 at least); the window only stands for it. EGL is
+/// Every context draws to a pbuffer of the size in its traits (1 x 1 at least), or of the surface of its window where
+/// that is larger (`OffscreenSurface`); the window only stands for it. EGL is
 /// opened with the first context. Contexts may outlive this object.
 class EglGraphics : public host::Graphics
 {

@@ -5,6 +5,14 @@
 namespace hosts
 {
 
+/// A window whose surface is larger than what is drawn to at present.
+class OffscreenSurface
+{
+public:
+    virtual ~OffscreenSurface() = default;
+    virtual host::Rectangle GetSurfaceRectangle() const = 0;
+};
+
 /// A window that nobody sees: just a size. What is drawn to it is read back from its context.
 class OffscreenWindow : public host::Window
 {

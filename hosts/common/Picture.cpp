@@ -22,38 +22,13 @@ namespace
 
 constexpr int sheetGap = 8;
 constexpr unsigned char sheetGrey = 40;
+constexpr unsigned char partsGrey = 96;
 
 osg::ref_ptr<osg::Image> NewPicture(int width, int height)
 {
     osg::ref_ptr<osg::Image> picture = new osg::Image;
     picture->allocateImage(width, height, 1, GL_RGB, GL_UNSIGNED_BYTE);
     return picture;
-}
-
-/// `picture` at another size; each pixel is the mean of the source pixels under it, so that thin lines don't vanish.
-osg::ref_ptr<osg::Image> Scaled(const osg::Image& picture, int width, int height)
-{
-    osg::ref_ptr<osg::Image> scaled = NewPicture(width, height);
-    const auto span = [](int at, int count, int sourceCount)
-    {
-        const int first = at * sourceCount / count;
-        return std::pair(first, std::max(first + 1, (at + 1) * sourceCount / count));
-    };
-    for (int y = 0; y < height; ++y)
-        for (int x = 0; x < width; ++x)
-        {
-            const auto [left, right] = span(x, width, picture.s());
-            const auto [bottom, top] = span(y, height, picture.t());
-            int sum[3] = {0, 0, 0};
-            for (int sourceY = bottom; sourceY < top; ++sourceY)
-                for (int sourceX = left; sourceX < right; ++sourceX)
-                    for (int channel = 0; channel < 3; ++channel)
-                        sum[channel] += picture.data(sourceX, sourceY)[channel];
-            const int count = (right - left) * (top - bottom);
-            for (int channel = 0; channel < 3; ++channel)
-                scaled->data(x, y)[channel] = static_cast<unsigned char>((sum[channel] + count / 2) / count);
-        }
-    return scaled;
 }
 
 /// A copy of the window's colours with one sample a pixel, to be read from for its lifetime.
@@ -143,6 +118,40 @@ std::string WritePicture(const osg::Image& picture, const std::filesystem::path&
     return base::WriteWholeFile(path, png.view());
 }
 
+osg::ref_ptr<osg::Image> ScalePicture(const osg::Image& picture, int width, int height)
+{
+    osg::ref_ptr<osg::Image> scaled = NewPicture(width, height);
+    const auto span = [](int at, int count, int sourceCount)
+    {
+        const int first = at * sourceCount / count;
+        return std::pair(first, std::max(first + 1, (at + 1) * sourceCount / count));
+    };
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x)
+        {
+            const auto [left, right] = span(x, width, picture.s());
+            const auto [bottom, top] = span(y, height, picture.t());
+            int sum[3] = {0, 0, 0};
+            for (int sourceY = bottom; sourceY < top; ++sourceY)
+                for (int sourceX = left; sourceX < right; ++sourceX)
+                    for (int channel = 0; channel < 3; ++channel)
+                        sum[channel] += picture.data(sourceX, sourceY)[channel];
+            const int count = (right - left) * (top - bottom);
+            for (int channel = 0; channel < 3; ++channel)
+                scaled->data(x, y)[channel] = static_cast<unsigned char>((sum[channel] + count / 2) / count);
+        }
+    return scaled;
+}
+
+osg::ref_ptr<osg::Image> ComposePicture(const std::vector<PlacedPicture>& parts, int width, int height)
+{
+    osg::ref_ptr<osg::Image> whole = NewPicture(width, height);
+    std::memset(whole->data(), partsGrey, whole->getTotalSizeInBytes());
+    for (const PlacedPicture& part : parts)
+        Paste(*part.picture, *whole, part.left, part.bottom);
+    return whole;
+}
+
 osg::ref_ptr<osg::Image> ComposeContactSheet(const std::vector<osg::ref_ptr<osg::Image>>& pictures, int columns,
                                              int cellWidth)
 {
@@ -167,7 +176,8 @@ osg::ref_ptr<osg::Image> ComposeContactSheet(const std::vector<osg::ref_ptr<osg:
             continue;
         const int row = rows - 1 - index / usedColumns; // the first row is the top one
         const int height = std::max(1, picture->t() * cellWidth / picture->s());
-        Paste(*Scaled(*picture, cellWidth, height), *sheet, sheetGap + index % usedColumns * (cellWidth + sheetGap),
+        Paste(*ScalePicture(*picture, cellWidth, height), *sheet,
+              sheetGap + index % usedColumns * (cellWidth + sheetGap),
               sheetGap + row * (cellHeight + sheetGap) + (cellHeight - height) / 2);
     }
     return sheet;

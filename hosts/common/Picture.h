@@ -22,6 +22,20 @@ osg::ref_ptr<osg::Image> ReadPicture(osg::Camera& camera);
 /// Writes `picture` as a PNG file that appears whole or not at all. Empty on success, else the reason with the path.
 std::string WritePicture(const osg::Image& picture, const std::filesystem::path& path);
 
+/// A picture and where its lower left corner lies in a larger one, in pixels.
+struct PlacedPicture
+{
+    osg::ref_ptr<osg::Image> picture;
+    int left = 0;
+    int bottom = 0;
+};
+
+/// The parts on a grey ground of that size. Parts are 8-bit RGB and lie within it.
+osg::ref_ptr<osg::Image> ComposePicture(const std::vector<PlacedPicture>& parts, int width, int height);
+
+/// `picture` at another size: each pixel is the mean of the source pixels under it, so that thin lines don't vanish.
+osg::ref_ptr<osg::Image> ScalePicture(const osg::Image& picture, int width, int height);
+
 /// All pictures in rows of `columns`, each as wide as `cellWidth` pixels (the height follows its own proportions),
 /// with small gaps between. Pictures are 8-bit RGB; a null one leaves its cell empty. Null without any picture.
 osg::ref_ptr<osg::Image> ComposeContactSheet(const std::vector<osg::ref_ptr<osg::Image>>& pictures, int columns,

@@ -47,7 +47,8 @@ struct PathOption
     const char* name;
     bool behindEquals; ///< the path stands behind "NAME="
 };
-constexpr PathOption pathOptions[] = {{"--static", false}, {"--movable", true}, {"--data", false}, {"--shots", false}};
+constexpr PathOption pathOptions[] = {
+    {"--static", false}, {"--movable", true}, {"--data", false}, {"--shots", false}, {"--scene", false}};
 
 const PathOption* FindPathOption(const std::string& name)
 {
@@ -105,6 +106,15 @@ Triple ParseTriple(const std::string& text)
     if (numbers.size() != 3)
         throw ArgumentError("\"" + text + "\" should be three numbers: x,y,z");
     return {numbers[0], numbers[1], numbers[2]};
+}
+
+std::array<double, 2> ParseFractions(const std::string& text)
+{
+    const std::vector<double> numbers = ParseNumbers(text);
+    const auto isFraction = [](double number) { return number >= 0.0 && number <= 1.0; };
+    if (numbers.size() != 2 || !isFraction(numbers[0]) || !isFraction(numbers[1]))
+        throw ArgumentError("\"" + text + "\" should be two numbers from 0 to 1: x,y");
+    return {numbers[0], numbers[1]};
 }
 
 Size ParseSize(const std::string& text)

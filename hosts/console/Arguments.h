@@ -22,6 +22,16 @@ using Triple = std::array<double, 3>;
 /// "x,y,z": exactly three finite numbers.
 Triple ParseTriple(const std::string& text);
 
+/// Where an eye is, and the point that it looks at: metres, in the axes of the scene, z up.
+struct Place
+{
+    Triple eye{};
+    Triple look{};
+};
+
+/// "x,y": exactly two numbers from 0 to 1.
+std::array<double, 2> ParseFractions(const std::string& text);
+
 struct Size
 {
     int width = 1280;

@@ -1,6 +1,9 @@
 #pragma once
 
+#include <array>
+#include <cstdint>
 #include <filesystem>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -24,28 +27,44 @@ void AddMdfImportCommand(CLI::App& mdf, int& status);
 void AddMdfExportCommand(CLI::App& mdf, int& status);
 void AddMdfInfoCommand(CLI::App& mdf, int& status);
 void AddPointsCommand(CLI::App& program, int& status);
+void AddSceneInfoCommand(CLI::App& scene, int& status);
+void AddSceneNewCommand(CLI::App& scene, int& status);
+void AddSceneCopyCommand(CLI::App& scene, int& status);
 
 /// Arguments that tell the scene and the view, the same for several commands.
 struct ViewArguments
 {
     SceneArguments scene;
-    Triple eye{};
-    Triple look{};
+    std::optional<Triple> eye;
+    std::optional<Triple> look;
+    std::optional<Place> place; ///< of both
+    int pane = 0;               ///< 1 to 4; 0 the one that the scene has active
+    bool all = false;           ///< the layout of the scene, as without any choice
+    std::string observer;
+    std::optional<std::int32_t> layout;
+    std::optional<std::array<double, 2>> splitter;
     Size size;
     bool verbose = false;
+
+    /// One pane over the whole picture is asked for, not the layout.
+    bool ShowsOnePane() const { return !all && (pane != 0 || !observer.empty() || place); }
 };
 
-struct ViewOptions
-{
-    CLI::Option* eye;
-    CLI::Option* look;
-    CLI::Option* data;
-};
+/// Bodies and the data that move them, given one by one or as a scene file.
+void AddSceneOptions(CLI::App& command, SceneArguments& scene);
+void AddDataOption(CLI::App& command, SceneArguments& scene);
 
-ViewOptions AddViewOptions(CLI::App& command, ViewArguments& arguments);
+/// `--scene`, which stands for the bodies.
+void AddSceneFileOption(CLI::App& command, SceneArguments& scene);
 
-/// Throws what the parser makes "wrong arguments" of when two bodies have one name, or the eye looks at itself.
-void CheckViewArguments(const ViewArguments& arguments);
+void AddPlaceOptions(CLI::App& command, ViewArguments& arguments);
+
+/// The scene, and what the picture shows of it.
+void AddViewOptions(CLI::App& command, ViewArguments& arguments);
+
+/// Makes `place` of the eye and its point. Throws what the parser makes "wrong arguments" of when the arguments
+/// contradict each other: two bodies of one name, an eye that looks at itself, bodies beside a scene file.
+void CheckViewArguments(ViewArguments& arguments);
 [[noreturn]] void RejectArguments(const std::string& reason);
 
 } // namespace console

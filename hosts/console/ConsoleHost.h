@@ -14,6 +14,7 @@
 #include "hosts/common/IdleLoop.h"
 #include "hosts/common/IniFile.h"
 #include "hosts/common/IniTexts.h"
+#include "hosts/common/OffscreenViews.h"
 #include "hosts/common/SystemClock.h"
 #include "hosts/common/SystemPaths.h"
 #include "hosts/console/ConsoleMessages.h"
@@ -58,7 +59,7 @@ public:
 };
 
 /// The program around the component on a console: messages and progress on standard error, settings under the XDG
-/// folder, pictures off-screen. It has no menus, tool bars or panes, so there is no user interface service.
+/// folder, pictures off-screen. It has no menus and tool bars, so there is no user interface service.
 class ConsoleHost : public host::Host
 {
 public:
@@ -79,9 +80,10 @@ public:
     host::Settings* GetSettings() override { return &settings; }
     host::Questions* GetQuestions() override { return &questions; }
     host::Graphics* GetGraphics() override { return &graphics; }
-    host::ViewWindows* GetViewWindows() override { return nullptr; }
+    host::ViewWindows* GetViewWindows() override { return &views; }
 
     hosts::IdleLoop& GetIdleLoop() { return loop; }
+    hosts::OffscreenViews& GetViews() { return views; }
     ConsoleMessages& GetMessages() { return messages; }
     Terminal& GetTerminal() { return terminal; }
 
@@ -106,6 +108,7 @@ private:
     ConsoleVariables variables;
     ConsoleQuestions questions;
     hosts::EglGraphics graphics;
+    hosts::OffscreenViews views{clock};
     hosts::DocumentList documents;
 };
 

@@ -6,6 +6,7 @@
 namespace console
 {
 
+inline constexpr std::uint32_t messageSceneNotReadable = 496; ///< the component's own; %1 the file, %2 the reason
 inline constexpr std::uint32_t messageNoFilePoint = 9110;
 inline constexpr std::uint32_t messageDataUnusable = 9111;      ///< %1 the file
 inline constexpr std::uint32_t messageNoChannel = 9112;         ///< %1 the body, %2 the channel
@@ -13,6 +14,7 @@ inline constexpr std::uint32_t messageChannelsAre = 9113;       ///< %1 their na
 inline constexpr std::uint32_t messageTimeOutside = 9114;       ///< %1 the time, %2 the span
 inline constexpr std::uint32_t messageNoSuchFrame = 9115;       ///< %1 the frame, %2 the range
 inline constexpr std::uint32_t messageNoTimeStamps = 9116;      ///< %1 the file
+inline constexpr std::uint32_t messageNoObserver = 9117;        ///< %1 the observer, %2 those there are
 inline constexpr std::uint32_t messagePictureNotWritten = 9120; ///< %1 file and reason
 inline constexpr std::uint32_t messagePictureNotRead = 9121;
 inline constexpr std::uint32_t messageFolderNotMade = 9122; ///< %1 folder and reason

@@ -1,13 +1,19 @@
 #include "hosts/console/ConsoleView.h"
 
-#include <osg/Light>
-#include <osg/LightSource>
+#include <algorithm>
 
-#include "hosts/common/EglGraphics.h"
+#include "app/PanoramicDocument.h"
+#include "base/Text.h"
+#include "host/ViewWindows.h"
 #include "hosts/common/Picture.h"
 #include "hosts/console/ConsoleHost.h"
+#include "hosts/console/ConsoleTexts.h"
+#include "interaction/FollowMode.h"
+#include "interaction/Observer.h"
+#include "interaction/Observers.h"
+#include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
 #include "render/Viewer.h"
-#include "scene/Scene3D.h"
 
 namespace console
 {
@@ -16,84 +22,123 @@ namespace
 {
 
 constexpr std::uint32_t messageNoContext = 532; // %1 the reason
+constexpr std::uint32_t timerInterval = 10;     // milliseconds
 
-const osg::Vec4 skyBlue(200 / 255.0F, 230 / 255.0F, 1.0F, 1.0F);
-
-osg::ref_ptr<osg::Light> HeadLight()
+// How many times larger than the picture the panes are drawn.
+int Magnification(const Size& picture)
 {
-    osg::ref_ptr<osg::Light> light = new osg::Light;
-    light->setLightNum(0);
-    light->setAmbient(osg::Vec4(0.0F, 0.0F, 0.0F, 1.0F));
-    light->setDiffuse(osg::Vec4(0.25F, 0.25F, 0.28F, 1.0F));
-    light->setSpecular(osg::Vec4(0.0F, 0.0F, 0.0F, 1.0F));
-    return light;
+    const int smallest = std::min(picture.width, picture.height);
+    return (VtCSplitterEx::minimumSize + smallest - 1) / smallest;
 }
 
-osg::ref_ptr<osg::LightSource> Sun()
+void WaitForViews(ConsoleHost& host, const VtCChildFrame& frame)
 {
-    osg::ref_ptr<osg::Light> light = new osg::Light;
-    light->setLightNum(1);
-    light->setPosition(osg::Vec4(-0.45F, -0.6F, 0.66F, 0.0F)); // a direction: the last is 0
-    light->setAmbient(osg::Vec4(0.50F, 0.52F, 0.56F, 1.0F));
-    light->setDiffuse(osg::Vec4(1.00F, 0.97F, 0.90F, 1.0F));
-    light->setSpecular(osg::Vec4(0.6F, 0.6F, 0.55F, 1.0F));
-    osg::ref_ptr<osg::LightSource> source = new osg::LightSource;
-    source->setLight(light);
-    return source;
+    while (!frame.areViewsCreated())
+    {
+        host.GetViews().RunTimers();
+        if (!frame.areViewsCreated())
+            host.GetClock().Sleep(timerInterval);
+    }
+}
+
+std::string ObserverNames(const VtC3DObservers& observers)
+{
+    std::wstring text;
+    for (const VtC3DObserver* observer : observers.GetObservers())
+        text += (text.empty() ? L"" : L", ") + observer->GetName();
+    return base::Utf8(text);
 }
 
 } // namespace
 
-std::unique_ptr<ConsoleView> ConsoleView::Create(ConsoleHost& host, VtCScene3D& scene, const Size& size)
+void PlaceFreeObserver(VtCPanoramicDocument& document, const Place& place)
 {
-    std::unique_ptr<ConsoleView> made(new ConsoleView(size));
-    createViewer();
-    createSharedContext(made->window);
-    if (getSharedContext())
-        made->view = createView(made->window, made->window.GetClientRectangle());
-    if (!made->view || !made->view->getCamera()->getGraphicsContext())
+    VtC3DObserver& observer = *document.GetObservers().GetFree1();
+    if (observer.GetFollowMode() != followFree)
+        observer.SetFollowModeIndex(followFree);
+    const osg::Vec3d from(place.eye[0], place.eye[1], place.eye[2]);
+    const osg::Vec3d to(place.look[0], place.look[1], place.look[2]);
+    // Straight up or down there is no "up" by z; then north is.
+    const bool upright = to.x() != from.x() || to.y() != from.y();
+    const osg::Matrixd viewMatrix = osg::Matrixd::lookAt(from, to, upright ? osg::Vec3d(0, 0, 1) : osg::Vec3d(0, 1, 0));
+    observer.StoreFreeView(from, osg::Matrixd::inverse(viewMatrix).getRotate());
+    observer.PushViewMatrix();
+}
+
+void ConsoleView::Prepare(ConsoleHost& host, const Size& picture)
+{
+    const int times = Magnification(picture);
+    host.GetViews().SetSize(picture.width * times, picture.height * times);
+}
+
+std::unique_ptr<ConsoleView> ConsoleView::Create(ConsoleHost& host, VtCPanoramicDocument& document,
+                                                 const ViewArguments& arguments)
+{
+    std::unique_ptr<ConsoleView> made(new ConsoleView(document, arguments.size));
+    const VtCChildFrame& frame = *document.GetChildFrame();
+    WaitForViews(host, frame);
+    const osgViewer::View* view = frame.getSplitter().getView(1)->getView();
+    if (!getSharedContext() || !view->getCamera()->getGraphicsContext())
     {
         host.GetMessages().Show({.number = messageNoContext,
                                  .first = host.GetGraphics()->GetLastError(),
                                  .severity = host::Severity::error});
         return nullptr;
     }
-    made->Light(scene);
-    addViewToViewer(made->view.get());
-    renderingEnabled = true;
-    return made;
+    return made->Arrange(host, arguments) ? std::move(made) : nullptr;
 }
 
-ConsoleView::~ConsoleView()
+bool ConsoleView::Arrange(ConsoleHost& host, const ViewArguments& arguments)
 {
-    removeViewFromViewer(view.get());
+    VtCChildFrame& frame = *document.GetChildFrame();
+    if (arguments.pane != 0)
+        frame.activateView(*frame.getSplitter().getView(arguments.pane));
+    if (arguments.splitter)
+        frame.getSplitter().setSplitterPosition((*arguments.splitter)[0], (*arguments.splitter)[1]);
+    else if (arguments.layout)
+        frame.ApplyLayout(*arguments.layout);
+    else if (arguments.ShowsOnePane())
+        frame.ApplyLayout(layoutSingle);
+    if (!arguments.observer.empty() && !frame.GetActiveView()->assignObserverByName(base::Wide(arguments.observer)))
+    {
+        host.ShowError(messageNoObserver, arguments.observer, ObserverNames(document.GetObservers()));
+        return false;
+    }
+    if (arguments.place)
+        LookAt(*arguments.place);
+    return true;
 }
 
-void ConsoleView::Light(VtCScene3D& scene)
+void ConsoleView::LookAt(const Place& place)
 {
-    view->setLightingMode(osg::View::HEADLIGHT);
-    view->setLight(HeadLight().get());
-    view->getCamera()->setClearColor(skyBlue);
-
-    const osg::ref_ptr<osg::Group> lit = new osg::Group;
-    lit->addChild(scene.GetRootNode());
-    lit->addChild(Sun());
-    view->setSceneData(lit.get());
-}
-
-void ConsoleView::LookAt(const Triple& eye, const Triple& look)
-{
-    const osg::Vec3d from(eye[0], eye[1], eye[2]);
-    const osg::Vec3d to(look[0], look[1], look[2]);
-    // Straight up or down there is no "up" by z; then north is.
-    const bool upright = (to - from) * osg::Vec3d(0, 0, 1) != (to - from).length() &&
-                         (to - from) * osg::Vec3d(0, 0, 1) != -(to - from).length();
-    view->getCamera()->setViewMatrixAsLookAt(from, to, upright ? osg::Vec3d(0, 0, 1) : osg::Vec3d(0, 1, 0));
+    VtCPanoramicView& view = *document.GetChildFrame()->GetActiveView();
+    const VtC3DObserver* observer = document.GetObservers().GetFree1();
+    if (view.getObserver() != observer)
+        view.assignObserverByName(observer->GetName());
+    PlaceFreeObserver(document, place);
 }
 
 osg::ref_ptr<osg::Image> ConsoleView::Read()
 {
-    return hosts::ReadPicture(*view->getCamera());
+    const VtCSplitterEx& splitter = document.GetChildFrame()->getSplitter();
+    const host::Rectangle client = splitter.getWindow().GetClientRectangle();
+    std::vector<hosts::PlacedPicture> parts;
+    bool complete = true;
+    splitter.forEachView(
+        [&](VtCPanoramicView& view)
+        {
+            const host::Rectangle place = view.getWindow().GetRectangleInParent();
+            if (place.width <= 0 || place.height <= 0)
+                return;
+            const osg::ref_ptr<osg::Image> part = hosts::ReadPicture(*view.getView()->getCamera());
+            complete = complete && part;
+            if (part)
+                parts.push_back({part, place.x, client.height - place.y - place.height});
+        });
+    if (!complete || parts.empty())
+        return nullptr;
+    osg::ref_ptr<osg::Image> whole = hosts::ComposePicture(parts, client.width, client.height);
+    return client.width == picture.width ? whole : hosts::ScalePicture(*whole, picture.width, picture.height);
 }
 
 } // namespace console

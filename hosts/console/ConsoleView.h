@@ -4,43 +4,49 @@
 
 #include <osg/Image>
 #include <osg/ref_ptr>
-#include <osgViewer/View>
 
-#include "hosts/common/OffscreenWindow.h"
-#include "hosts/console/Arguments.h"
+#include "hosts/console/Command.h"
 
-class VtCScene3D;
+class VtCChildFrame;
+class VtCPanoramicDocument;
+class VtCPanoramicView;
 
 namespace console
 {
 
 class ConsoleHost;
 
-/// The one view of a console command: off-screen, on a scene that is lit as on a clear day.
-///
-/// A scene by itself has no light but switches for two: its atmospherics set them. Here the first is a weak head
-/// light, so that no side is black, and the second the sun, high in the south-west; the background is a sky blue.
+/// Puts the observer "Free1" there, and into its record. The two points must not be the same.
+void PlaceFreeObserver(VtCPanoramicDocument& document, const Place& place);
+
+/// What a console command shows of a scene: its four panes, or one of them over the whole picture, off-screen.
 class ConsoleView
 {
 public:
-    /// Null after message 532 when there is no graphics context to be had. `scene` outlives the view.
-    static std::unique_ptr<ConsoleView> Create(ConsoleHost& host, VtCScene3D& scene, const Size& size);
-    ~ConsoleView();
+    /// Says how large the panes are. Before the document is made, whose frame takes that size.
+    ///
+    /// Panes below 100 pixels collapse, so a picture that is smaller is drawn larger and scaled down.
+    static void Prepare(ConsoleHost& host, const Size& picture);
+
+    /// Waits for the views, and arranges them as the arguments tell. Null after an error message: there is no graphics
+    /// context to be had, or no observer of that name. `document` outlives the view.
+    static std::unique_ptr<ConsoleView> Create(ConsoleHost& host, VtCPanoramicDocument& document,
+                                               const ViewArguments& arguments);
     ConsoleView(const ConsoleView&) = delete;
     ConsoleView& operator=(const ConsoleView&) = delete;
 
-    /// Puts the eye; both in the axes of the scene, z up. They must not be the same point.
-    void LookAt(const Triple& eye, const Triple& look);
+    /// Looks through the observer "Free1" in the active pane, and puts it there.
+    void LookAt(const Place& place);
 
     /// What the last frame drew; null when it can't be had.
     osg::ref_ptr<osg::Image> Read();
 
 private:
-    explicit ConsoleView(const Size& size) : window(size.width, size.height) {}
-    void Light(VtCScene3D& scene);
+    ConsoleView(VtCPanoramicDocument& viewed, const Size& size) : document(viewed), picture(size) {}
+    bool Arrange(ConsoleHost& host, const ViewArguments& arguments);
 
-    hosts::OffscreenWindow window;
-    osg::ref_ptr<osgViewer::View> view;
+    VtCPanoramicDocument& document;
+    Size picture;
 };
 
 } // namespace console

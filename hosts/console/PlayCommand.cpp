@@ -47,17 +47,13 @@ int Run(const Play& play)
     Session session(play.view.verbose);
     if (!play.headless)
         session.GetHost().ShowInformation(messageAlwaysHeadless);
-    VtCPanoramicDocument* document = session.NewDocument();
+    ConsoleView::Prepare(session.GetHost(), play.view.size);
+    VtCPanoramicDocument* document = OpenScene(session, play.view.scene);
     if (!document)
-        return session.GetExitStatus();
-    const std::unique_ptr<ConsoleView> view =
-        ConsoleView::Create(session.GetHost(), *document->GetScene(), play.view.size);
+        return Session::failed;
+    const std::unique_ptr<ConsoleView> view = ConsoleView::Create(session.GetHost(), *document, play.view);
     if (!view)
-        return session.GetExitStatus();
-
-    BuildBodies(session, *document, play.view.scene);
-    if (!LoadData(session, play.view.scene.data) || !BindChannels(session, *document, play.view.scene.movables))
-        return session.GetExitStatus();
+        return Session::failed;
 
     Playback playback(session, *view, play.view, play.playback);
     if (playback.Prepare())
@@ -73,12 +69,17 @@ void Check(Play& play)
     play.playback.speed = *speed;
     if (!play.playback.shotsFile.empty())
         play.playback.shots = ReadShots(play.playback.shotsFile);
-    if (!play.playback.shots.empty() && play.view.eye == play.view.look)
-    {
-        play.view.eye = play.playback.shots.front().eye;
-        play.view.look = play.playback.shots.front().look;
-    }
     CheckViewArguments(play.view);
+    if (play.view.scene.data.empty())
+        RejectArguments("--data is required");
+    const bool hasScene = !play.view.scene.file.empty();
+    if (!hasScene && !play.view.place && play.playback.shots.empty())
+        RejectArguments("--eye and --look are required without --scene and --shots");
+    for (const Shot& shot : play.playback.shots)
+        if (!hasScene && !play.view.place && !shot.place)
+            RejectArguments("--shots: \"" + shot.name + "\" has no eye, and there is neither --eye nor --scene");
+    if (!hasScene && !play.view.place)
+        play.view.place = play.playback.shots.front().place;
 }
 
 } // namespace
@@ -87,10 +88,7 @@ void AddPlayCommand(CLI::App& program, int& status)
 {
     auto play = std::make_shared<Play>();
     CLI::App* command = program.add_subcommand("play", "Replay a run in real time; tell how many frames a second.");
-    const ViewOptions options = AddViewOptions(*command, play->view);
-    options.data->required();
-    options.eye->needs(options.look);
-    options.look->needs(options.eye);
+    AddViewOptions(*command, play->view);
     command->add_option("--speed", play->speedText, "Seconds of the data in a second.")->type_name("F");
     command->add_option("--loop", play->playback.passes, "How many times the run is played. [1]")
         ->type_name("N")
@@ -103,7 +101,8 @@ void AddPlayCommand(CLI::App& program, int& status)
                                 ->type_name("FOLDER");
     CLI::Option* shots = command
                              ->add_option("--shots", play->playback.shotsFile,
-                                          "When pictures are taken: a file of lines \"time ex,ey,ez lx,ly,lz name\".")
+                                          "When pictures are taken: a file of lines \"time ex,ey,ez lx,ly,lz name\" "
+                                          "or \"time name\".")
                              ->type_name("FILE")
                              ->needs(pictures);
     command
@@ -114,15 +113,14 @@ void AddPlayCommand(CLI::App& program, int& status)
         ->needs(pictures)
         ->excludes(shots);
     command->footer("Examples:\n"
+                    "  panoramic play --scene scene.xml --data run.mdf --pictures out --headless\n"
                     "  panoramic play --static road.dae --movable Car=car.dae:Chassis --data run.mdf \\\n"
                     "      --eye -8,-12,4 --look 0,0,1 --headless\n"
                     "  panoramic play @scene.args --shots shots.txt --pictures out --headless\n"
                     "Ctrl-C ends it cleanly.");
     command->callback(
-        [play, options, shots, &status]
+        [play, &status]
         {
-            if (options.eye->count() == 0 && shots->count() == 0)
-                RejectArguments("--eye and --look are required without --shots");
             try
             {
                 Check(*play);

@@ -37,8 +37,7 @@ bool Playback::Prepare()
         return true;
     const std::optional<TimeSpan> span = GetTimeSpan(session);
     if (span && arguments.shots.empty())
-        arguments.shots =
-            EquallySpacedShots(span->first, span->last, arguments.count, viewArguments.eye, viewArguments.look);
+        arguments.shots = EquallySpacedShots(span->first, span->last, arguments.count);
     // Without time stamps there is one shot's worth of message, and no shot.
     if (!span)
         return CheckTime(session, 0.0, viewArguments.scene.data);
@@ -56,7 +55,6 @@ bool Playback::Prepare()
 
 void Playback::Run(const volatile std::sig_atomic_t& interrupted)
 {
-    view.LookAt(viewArguments.eye, viewArguments.look);
     session.GetController().SetSpeed(arguments.speed);
     host::Progress& progress = *session.GetHost().GetProgress();
 
@@ -124,10 +122,12 @@ void Playback::Take(const Shot& shot)
 {
     // The replay has gone on a little; the picture is to be of the shot's own time, on any machine.
     GoToTime(session, shot.time, viewArguments.scene.data);
-    view.LookAt(shot.eye, shot.look);
+    if (shot.place)
+        view.LookAt(*shot.place);
     session.GetApp().RedrawNow();
     const osg::ref_ptr<osg::Image> picture = view.Read();
-    view.LookAt(viewArguments.eye, viewArguments.look);
+    if (shot.place && viewArguments.place)
+        view.LookAt(*viewArguments.place);
     if (!picture)
     {
         session.GetHost().ShowError(messagePictureNotRead);

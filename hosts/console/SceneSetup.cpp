@@ -91,6 +91,20 @@ std::string Joined(const std::vector<std::wstring>& names)
 
 } // namespace
 
+VtCPanoramicDocument* OpenScene(Session& session, const SceneArguments& scene)
+{
+    // The data come first: a body finds its channel by name only where there are channels.
+    if (!scene.data.empty() && !LoadData(session, scene.data))
+        return nullptr;
+    if (!scene.file.empty())
+        return session.OpenDocument(Complete(scene.file));
+    VtCPanoramicDocument* document = session.NewDocument();
+    if (!document)
+        return nullptr;
+    BuildBodies(session, *document, scene);
+    return scene.data.empty() || BindChannels(session, *document, scene.movables) ? document : nullptr;
+}
+
 void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneArguments& scene)
 {
     host::Progress& progress = *session.GetHost().GetProgress();

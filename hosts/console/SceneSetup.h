@@ -17,10 +17,14 @@ class Session;
 /// The scene that a command shows, and the data that move it.
 struct SceneArguments
 {
+    std::filesystem::path file; ///< empty: the bodies are given one by one
     std::vector<StaticArgument> statics;
     std::vector<MovableArgument> movables;
     std::filesystem::path data; ///< empty: none
 };
+
+/// Opens the scene with its data. Null after an error message.
+VtCPanoramicDocument* OpenScene(Session& session, const SceneArguments& scene);
 
 /// Makes the bodies of the scene in `document`. A model that isn't there is shown as an error; its body exists
 /// without geometry, and the rest is made all the same.

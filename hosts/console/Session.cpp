@@ -1,6 +1,7 @@
 #include "hosts/console/Session.h"
 
 #include "app/PanoramicDocument.h"
+#include "base/Paths.h"
 #include "simdata/SimulationDataController.h"
 
 namespace console
@@ -34,6 +35,11 @@ Session::~Session()
 VtCPanoramicDocument* Session::NewDocument()
 {
     return dynamic_cast<VtCPanoramicDocument*>(host.GetDocumentManager()->NewDocument());
+}
+
+VtCPanoramicDocument* Session::OpenDocument(const std::filesystem::path& scene)
+{
+    return dynamic_cast<VtCPanoramicDocument*>(host.GetDocumentManager()->OpenDocument(base::InnerPath(scene)));
 }
 
 } // namespace console

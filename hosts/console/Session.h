@@ -1,5 +1,7 @@
 #pragma once
 
+#include <filesystem>
+
 #include "app/PanoramicApp.h"
 #include "hosts/console/ConsoleHost.h"
 
@@ -28,8 +30,14 @@ public:
     /// Null, after a message, when no scene can be shown.
     VtCPanoramicDocument* NewDocument();
 
+    /// Null, after a message, when it can't be read as a scene.
+    VtCPanoramicDocument* OpenDocument(const std::filesystem::path& scene);
+
     /// What the command ends with: 1 after an error message, else 0.
     int GetExitStatus() { return host.GetMessages().HasErrors() ? 1 : 0; }
+
+    /// What it ends with when it couldn't do its work, whatever the message was.
+    static constexpr int failed = 1;
 
 private:
     ConsoleHost host;

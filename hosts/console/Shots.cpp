@@ -18,18 +18,23 @@ namespace
 Shot ParseShot(const std::string& line)
 {
     std::istringstream words(line);
-    std::string time, eye, look, rest;
-    Shot shot;
-    if (!(words >> time >> eye >> look >> shot.name) || words >> rest)
-        throw ArgumentError("a shot is \"time ex,ey,ez lx,ly,lz name\"");
-    const auto seconds = base::ParseDouble(time);
+    std::vector<std::string> fields;
+    for (std::string word; words >> word;)
+        fields.push_back(word);
+    if (fields.size() != 2 && fields.size() != 4)
+        throw ArgumentError("a shot is \"time ex,ey,ez lx,ly,lz name\" or \"time name\"");
+    const auto seconds = base::ParseDouble(fields.front());
     if (!seconds)
-        throw ArgumentError("\"" + time + "\" is not a time");
+        throw ArgumentError("\"" + fields.front() + "\" is not a time");
+    Shot shot;
+    shot.name = fields.back();
     if (shot.name.find('/') != std::string::npos || shot.name.front() == '.')
         throw ArgumentError("\"" + shot.name + "\" is no name for a picture");
     shot.time = *seconds;
-    shot.eye = ParseTriple(eye);
-    shot.look = ParseTriple(look);
+    if (fields.size() == 4)
+        shot.place = Place{ParseTriple(fields[1]), ParseTriple(fields[2])};
+    if (shot.place && shot.place->eye == shot.place->look)
+        throw ArgumentError("the eye looks at itself");
     return shot;
 }
 
@@ -68,14 +73,14 @@ std::vector<Shot> ReadShots(const std::filesystem::path& file)
     return shots;
 }
 
-std::vector<Shot> EquallySpacedShots(double first, double last, int count, const Triple& eye, const Triple& look)
+std::vector<Shot> EquallySpacedShots(double first, double last, int count)
 {
     std::vector<Shot> shots;
     for (int i = 0; i < count; ++i)
     {
         const double part = count == 1 ? 0.5 : static_cast<double>(i) / (count - 1);
         const double time = first + (last - first) * part;
-        shots.push_back({time, eye, look, fmt::format("{:02}-{:.2f}s", i + 1, time)});
+        shots.push_back({time, std::nullopt, fmt::format("{:02}-{:.2f}s", i + 1, time)});
     }
     return shots;
 }

@@ -37,22 +37,14 @@ bool GoToMoment(Session& session, const Snapshot& snapshot)
 int Run(const Snapshot& snapshot)
 {
     Session session(snapshot.view.verbose);
-    VtCPanoramicDocument* document = session.NewDocument();
+    ConsoleView::Prepare(session.GetHost(), snapshot.view.size);
+    VtCPanoramicDocument* document = OpenScene(session, snapshot.view.scene);
     if (!document)
-        return session.GetExitStatus();
-    const std::unique_ptr<ConsoleView> view =
-        ConsoleView::Create(session.GetHost(), *document->GetScene(), snapshot.view.size);
-    if (!view)
-        return session.GetExitStatus();
+        return Session::failed;
+    const std::unique_ptr<ConsoleView> view = ConsoleView::Create(session.GetHost(), *document, snapshot.view);
+    if (!view || !GoToMoment(session, snapshot))
+        return Session::failed;
 
-    BuildBodies(session, *document, snapshot.view.scene);
-    const bool moved =
-        snapshot.view.scene.data.empty() ||
-        (LoadData(session, snapshot.view.scene.data) && BindChannels(session, *document, snapshot.view.scene.movables));
-    if (!moved || !GoToMoment(session, snapshot))
-        return session.GetExitStatus();
-
-    view->LookAt(snapshot.view.eye, snapshot.view.look);
     session.GetApp().RedrawNow();
     const osg::ref_ptr<osg::Image> picture = view->Read();
     if (!picture)
@@ -79,6 +71,8 @@ void Check(Snapshot& snapshot)
             RejectArguments("--time: \"" + snapshot.timeText + "\" is not a number");
     }
     CheckViewArguments(snapshot.view);
+    if (snapshot.view.scene.file.empty() && !snapshot.view.place)
+        RejectArguments("--eye and --look are required without --scene");
 }
 
 } // namespace
@@ -87,9 +81,7 @@ void AddSnapshotCommand(CLI::App& program, int& status)
 {
     auto snapshot = std::make_shared<Snapshot>();
     CLI::App* command = program.add_subcommand("snapshot", "Draw one picture of a scene at a moment of a run.");
-    const ViewOptions options = AddViewOptions(*command, snapshot->view);
-    options.eye->required();
-    options.look->required();
+    AddViewOptions(*command, snapshot->view);
     CLI::Option* time =
         command->add_option("--time", snapshot->timeText, "The moment, in seconds of the data.")->type_name("SECONDS");
     command->add_option("--frame", snapshot->frame, "The moment, as the number of a frame, from 1.")
@@ -97,9 +89,11 @@ void AddSnapshotCommand(CLI::App& program, int& status)
         ->check(CLI::PositiveNumber)
         ->excludes(time);
     command->add_option("-o,--output", snapshot->output, "The picture to write.")->type_name("PICTURE.png")->required();
-    command->footer("Example:\n"
-                    "  panoramic snapshot --static road.dae --movable Car=car.dae:Chassis --data run.mdf \\\n"
-                    "      --time 12.5 --eye -8,-12,4 --look 0,0,1 --size 1280x720 -o picture.png");
+    command->footer(
+        "Examples:\n"
+        "  panoramic snapshot --scene scene.xml --data run.mdf --time 12.5 --observer Driver -o picture.png\n"
+        "  panoramic snapshot --static road.dae --movable Car=car.dae:Chassis --data run.mdf \\\n"
+        "      --time 12.5 --eye -8,-12,4 --look 0,0,1 --size 1280x720 -o picture.png");
     command->callback(
         [snapshot, &status]
         {

@@ -44,6 +44,11 @@ int RunProgram(int argc, char** argv)
     console::AddMdfExportCommand(*mdf, status);
     console::AddMdfInfoCommand(*mdf, status);
     console::AddPointsCommand(program, status);
+    CLI::App* scene = program.add_subcommand("scene", "Make, copy and look into scene files.");
+    scene->require_subcommand(1);
+    console::AddSceneInfoCommand(*scene, status);
+    console::AddSceneNewCommand(*scene, status);
+    console::AddSceneCopyCommand(*scene, status);
 
     try
     {

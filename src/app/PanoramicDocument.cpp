@@ -17,6 +17,7 @@
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneObject.h"
+#include "scene/SceneObjectStore.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationDataReceiver.h"
 
@@ -29,6 +30,9 @@ constexpr std::uint32_t messageSaved = 524;            // %1 the file
 constexpr std::uint32_t messageNotSaved = 525;         // %1 the file, %2 the reason
 constexpr std::uint32_t textOtherFileType = 9014;      // why a file of another extension can't be read
 
+// The store serves all documents of the process; what a scene only kept goes with the last of them.
+int openDocuments = 0;
+
 std::wstring Shown(const std::wstring& path)
 {
     return base::Wide(base::NativePath(path).string());
@@ -38,6 +42,7 @@ std::wstring Shown(const std::wstring& path)
 
 VtCPanoramicDocument::VtCPanoramicDocument(VtCPanoramicApp& application) : app(application)
 {
+    ++openDocuments;
     if (!graphicsSession)
         graphicsSession = std::make_unique<VtCGraphicsSession>();
     ownedScene = std::make_unique<VtCScene3D>(*this);
@@ -67,6 +72,8 @@ VtCPanoramicDocument::~VtCPanoramicDocument()
     observers->Release();
     ownedScene.reset();
     destroyViewer();
+    if (--openDocuments == 0)
+        GetServices().store.Clear();
 }
 
 void VtCPanoramicDocument::MakeChildFrame()

@@ -262,5 +262,10 @@ void VtCSplitterEx::ApplyLayoutRecord(const std::wstring& id)
     windowLayout = record;
     if (const auto* position = record->Find<std::vector<float>>(L"splitter_position");
         position && position->size() == 2)
-        setSplitterPosition((*position)[0], (*position)[1]);
+    {
+        const std::vector<float> stored = *position;
+        setSplitterPosition(stored[0], stored[1]);
+        // The ratios of whole pixels, gap included, would move the bars a little with every load and save.
+        record->Write(L"splitter_position", stored);
+    }
 }

@@ -188,6 +188,12 @@ std::wstring MakeLibraryPath(std::int32_t kind, const std::wstring& entry, const
     return root + L'\\' + entry.substr(0, nameAt) + L"\\$" + name + L'\\' + name + L".dae";
 }
 
+std::wstring ExpandLibraryTokens(const std::wstring& path, const host::LibraryPaths& paths)
+{
+    const std::wstring expanded = base::Replace(path, customerToken, paths.GetCustomerPath());
+    return base::Replace(expanded, productToken, paths.GetObjectsPath());
+}
+
 bool HasLibraryToken(std::wstring_view path)
 {
     static const std::wstring tokens[] = {base::ToLower(productToken), base::ToLower(customerToken)};

@@ -29,6 +29,9 @@ std::wstring ResolveModelPath(const std::wstring& path, const host::LibraryPaths
 /// root. A doubled backslash behind the folder belongs to it.
 std::wstring MakeLibraryPath(std::int32_t kind, const std::wstring& entry, const host::LibraryPaths& paths);
 
+/// The path with the roots of this machine for the libraries' tokens, and nothing else changed.
+std::wstring ExpandLibraryTokens(const std::wstring& path, const host::LibraryPaths& paths);
+
 /// Whether the path holds a library's token, in any case.
 bool HasLibraryToken(std::wstring_view path);
 

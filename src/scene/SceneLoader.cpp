@@ -5,7 +5,6 @@
 #include "host/Messages.h"
 #include "host/Progress.h"
 #include "host/Questions.h"
-#include "scene/LibraryPath.h"
 #include "scene/MovableBody.h"
 #include "scene/RecordTables.h"
 #include "scene/Scene3D.h"
@@ -13,9 +12,9 @@
 #include "scene/SceneParts.h"
 #include "scene/SceneServices.h"
 #include "scene/StaticBody.h"
+#include "scene/StoredModel.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <optional>
 #include <utility>
 
@@ -57,12 +56,6 @@ std::int32_t NumberOf(const VtISceneObject& record, const wchar_t* attribute, st
 bool IsBody(const VtISceneObject& record)
 {
     return record.GetObjectType() == objectTypeStaticBody || record.GetObjectType() == objectTypeMovableBody;
-}
-
-bool IsFile(const std::wstring& path)
-{
-    std::error_code failure;
-    return std::filesystem::is_regular_file(base::NativePath(path), failure);
 }
 
 } // namespace
@@ -226,8 +219,8 @@ void VtCSceneLoader::PreloadModels()
     {
         std::vector<std::wstring> paths;
         for (const auto& record : records)
-            if (const std::wstring path = FindModel(TextOf(*record, L"file_path")); IsFile(path))
-                paths.push_back(path);
+            if (const ModelFile& model = FindModel(TextOf(*record, L"file_path")); model.exists)
+                paths.push_back(model.path);
         std::sort(paths.begin(), paths.end());
         paths.erase(std::unique(paths.begin(), paths.end()), paths.end());
         if (!paths.empty())
@@ -241,7 +234,7 @@ void VtCSceneLoader::BuildMovableBody(VtISceneObject& record)
 {
     const std::wstring id = Needed(record, L"internal_id");
     const std::wstring name = Needed(record, L"name");
-    const std::wstring path = FindModelOrReport(name, Needed(record, L"file_path"));
+    const std::wstring& path = FindModelOrReport(name, Needed(record, L"file_path"));
     Describe(name);
     auto* body = new VtC3DMovableBody(scene.GetDocument(), *scene.GetMovableBodies(0), name, path, osg::Matrixd(), true,
                                       nullptr, {});
@@ -273,7 +266,7 @@ void VtCSceneLoader::RememberStatic(VtCGlidePanelAbstractNavigatorObject& body)
 void VtCSceneLoader::BuildStaticBody(VtISceneObject& record)
 {
     const std::wstring name = Needed(record, L"name");
-    const std::wstring path = FindModelOrReport(name, Needed(record, L"file_path"));
+    const std::wstring& path = FindModelOrReport(name, Needed(record, L"file_path"));
     const std::wstring id = Needed(record, L"internal_id");
     const auto at = staticById.find(base::ToLower(TextOf(record, L"parent_object_id")));
     VtCGlidePanelAbstractNavigatorObject* parent = scene.GetStaticBodies();
@@ -287,8 +280,8 @@ void VtCSceneLoader::BuildStaticBody(VtISceneObject& record)
         body->ApplyAttributes(record);
         services.store.AddObject(id, &record);
         body->FinishLoad(id);
-        body->UpdateBaseTransform();
     }
+    body->UpdateBaseTransform();
     RememberStatic(*body);
     VtCGlidePanelAbstractNavigatorObject::Objects parts;
     body->CollectDescendants(parts);
@@ -343,34 +336,22 @@ const std::wstring& VtCSceneLoader::Needed(const VtISceneObject& record, const w
                             base::Utf8(attribute));
 }
 
-// A model outside the libraries is stored with its whole path behind the token, which no rule of the libraries leads
-// back to. So it is tried as it stands, and from the folder of the scene.
-std::wstring VtCSceneLoader::FindModel(const std::wstring& stored) const
+const VtCSceneLoader::ModelFile& VtCSceneLoader::FindModel(const std::wstring& stored)
 {
-    const std::wstring resolved = ResolveModelPath(stored, services.paths);
-    if (IsFile(resolved))
-        return resolved;
-
-    std::wstring_view rest = stored;
-    if (rest.starts_with(L'%'))
-        if (const std::size_t end = rest.find(L'%', 1); end != std::wstring_view::npos && HasLibraryToken(stored))
-            rest.remove_prefix(end + 1);
-    const std::wstring whole = NormalizeSeparators(rest);
-    if (IsFile(whole) && std::filesystem::path(base::NativePath(whole)).is_absolute())
-        return whole;
-
-    const std::wstring below = whole.starts_with(L'\\') ? whole.substr(1) : whole;
-    const std::wstring beside =
-        base::InnerPath((base::NativePath(file).parent_path() / base::NativePath(below)).lexically_normal());
-    return IsFile(beside) ? beside : resolved;
+    const auto known = modelFiles.find(stored);
+    if (known != modelFiles.end())
+        return known->second;
+    std::wstring path = FindStoredModel(stored, file, services.paths);
+    const bool exists = IsModelFile(path);
+    return modelFiles.emplace(stored, ModelFile{std::move(path), exists}).first->second;
 }
 
-std::wstring VtCSceneLoader::FindModelOrReport(const std::wstring& name, const std::wstring& stored) const
+const std::wstring& VtCSceneLoader::FindModelOrReport(const std::wstring& name, const std::wstring& stored)
 {
-    std::wstring path = FindModel(stored);
-    if (!IsFile(path))
-        services.messages.ShowError(messageNoModelFile, name, path);
-    return path;
+    const ModelFile& model = FindModel(stored);
+    if (!model.exists)
+        services.messages.ShowError(messageNoModelFile, name, model.path);
+    return model.path;
 }
 
 void VtCSceneLoader::Describe(const std::wstring& name)

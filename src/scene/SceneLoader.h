@@ -33,6 +33,12 @@ public:
 private:
     using Records = std::vector<osg::ref_ptr<VtISceneObject>>;
 
+    struct ModelFile
+    {
+        std::wstring path;
+        bool exists;
+    };
+
     void Sort(const Records& records);
     bool IsBuilt(const VtISceneObject& record) const;
     void ApplyRenderSettings(const Records& all);
@@ -47,8 +53,8 @@ private:
     void ApplyLayout();
 
     const std::wstring& Needed(const VtISceneObject& record, const wchar_t* attribute) const;
-    std::wstring FindModel(const std::wstring& stored) const;
-    std::wstring FindModelOrReport(const std::wstring& name, const std::wstring& stored) const;
+    const ModelFile& FindModel(const std::wstring& stored);
+    const std::wstring& FindModelOrReport(const std::wstring& name, const std::wstring& stored);
     void Describe(const std::wstring& name);
     void Step();
 
@@ -63,5 +69,5 @@ private:
     Records staticBodies;
     Records movableBodies;
     std::unordered_map<std::wstring, VtCGlidePanelAbstractNavigatorObject*> staticById; ///< keys in lower case
-    std::unordered_map<std::wstring, std::wstring> modelFiles; ///< the file of each stored path looked for
+    std::unordered_map<std::wstring, ModelFile> modelFiles; ///< by the stored path; a scene shows few models often
 };

@@ -114,15 +114,18 @@ TEST(Shots, AFileGivesThemByTimeAndNamesItsFaults)
 {
     const TemporaryFolder folder;
     const auto file = folder.Write("shots.txt", "# time eye look name\n2.5 1,2,3 0,0,0 second # behind the car\n\n"
-                                                "0 -1,-2,3 0,0,1 first\n");
+                                                "0 first\n");
     const std::vector<Shot> shots = ReadShots(file);
     ASSERT_EQ(shots.size(), 2U);
     EXPECT_EQ(shots[0].name, "first");
+    EXPECT_FALSE(shots[0].place) << "the eye stays";
     EXPECT_EQ(shots[1].time, 2.5);
-    EXPECT_EQ(shots[1].eye, (Triple{1, 2, 3}));
+    ASSERT_TRUE(shots[1].place);
+    EXPECT_EQ(shots[1].place->eye, (Triple{1, 2, 3}));
 
-    const char* wrong[] = {"1 1,2,3 0,0,0", "1 1,2,3 0,0,0 a b",  "x 1,2,3 0,0,0 a",
-                           "1 1,2 0,0,0 a", "1 1,2,3 0,0,0 ../a", "1 1,2,3 0,0,0 .a"};
+    const char* wrong[] = {"1 1,2,3 0,0,0",      "1 1,2,3 1,2,3 a", "1",
+                           "1 1,2,3 0,0,0 a b",  "x 1,2,3 0,0,0 a", "1 1,2 0,0,0 a",
+                           "1 1,2,3 0,0,0 ../a", "1 1,2,3 0,0,0 .a"};
     for (const char* line : wrong)
         EXPECT_NE(Refusal([&] { ReadShots(folder.Write("bad.txt", std::string("# a\n") + line)); }).find("line 2"),
                   std::string::npos)
@@ -135,13 +138,13 @@ TEST(Shots, AFileGivesThemByTimeAndNamesItsFaults)
 
 TEST(Shots, EqualDistancesReachBothEnds)
 {
-    const std::vector<Shot> shots = EquallySpacedShots(10.0, 20.0, 3, {1, 2, 3}, {});
+    const std::vector<Shot> shots = EquallySpacedShots(10.0, 20.0, 3);
     ASSERT_EQ(shots.size(), 3U);
     EXPECT_EQ(shots[0].time, 10.0);
     EXPECT_EQ(shots[1].time, 15.0);
     EXPECT_EQ(shots[2].time, 20.0);
     EXPECT_NE(shots[0].name, shots[1].name);
-    EXPECT_EQ(EquallySpacedShots(10.0, 20.0, 1, {}, {})[0].time, 15.0);
+    EXPECT_EQ(EquallySpacedShots(10.0, 20.0, 1)[0].time, 15.0);
 }
 
 } // namespace
