@@ -8,6 +8,7 @@
 #include "base/Numbers.h"
 #include "base/Paths.h"
 #include "base/Text.h"
+#include "host/LibraryPaths.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/Session.h"
 #include "render/AssetManager.h"
@@ -36,18 +37,33 @@ std::filesystem::path Complete(const std::filesystem::path& file)
     return std::filesystem::absolute(file).lexically_normal();
 }
 
+// A model of a library is stored as one whatever links it was named by, so it gets the name that the library has.
+std::wstring ModelPath(Session& session, const std::filesystem::path& file)
+{
+    const host::LibraryPaths& paths = session.GetHost().GetLibraryPaths();
+    std::error_code failed;
+    const std::filesystem::path real = std::filesystem::weakly_canonical(file, failed);
+    for (const std::wstring& library : {paths.GetObjectsPath(), paths.GetCustomerPath()})
+    {
+        const std::filesystem::path root = base::NativePath(library);
+        const std::filesystem::path inside = real.lexically_relative(std::filesystem::weakly_canonical(root, failed));
+        if (!inside.empty() && *inside.begin() != "..")
+            return base::InnerPath(root / inside);
+    }
+    return base::InnerPath(Complete(file));
+}
+
 VtTFloatTupel3 Floats(const Triple& numbers)
 {
     return {static_cast<float>(numbers[0]), static_cast<float>(numbers[1]), static_cast<float>(numbers[2])};
 }
 
-void BuildStatic(VtCPanoramicDocument& document, const StaticArgument& argument)
+void BuildStatic(Session& session, VtCPanoramicDocument& document, const StaticArgument& argument)
 {
-    const std::filesystem::path model = Complete(argument.model);
-    const std::wstring name = base::Wide(model.stem().string());
+    const std::wstring name = base::Wide(argument.model.stem().string());
     // The collection takes the one reference of a new body.
-    auto* body = new VtC3DStaticBody(document, *document.GetScene()->GetStaticBodies(), name, base::InnerPath(model),
-                                     osg::Matrixd(), true, {});
+    auto* body = new VtC3DStaticBody(document, *document.GetScene()->GetStaticBodies(), name,
+                                     ModelPath(session, argument.model), osg::Matrixd(), true, {});
     if (const osg::ref_ptr<VtISceneObject> record = body->GetAttributeObject())
     {
         record->Write(L"position", Floats(argument.position));
@@ -56,22 +72,21 @@ void BuildStatic(VtCPanoramicDocument& document, const StaticArgument& argument)
     body->AssignShaders();
 }
 
-void BuildMovable(VtCPanoramicDocument& document, const MovableArgument& argument)
+void BuildMovable(Session& session, VtCPanoramicDocument& document, const MovableArgument& argument)
 {
-    const std::filesystem::path model = Complete(argument.model);
     const std::wstring name = base::Wide(argument.name);
-    new VtC3DMovableBody(document, *document.GetScene()->GetMovableBodies(0), name, base::InnerPath(model),
+    new VtC3DMovableBody(document, *document.GetScene()->GetMovableBodies(0), name, ModelPath(session, argument.model),
                          osg::Matrixd(), true, nullptr, {});
 }
 
 // Reading models is the long part, and several can be read at a time.
-void PreloadModels(const SceneArguments& scene)
+void PreloadModels(Session& session, const SceneArguments& scene)
 {
     std::vector<std::wstring> statics, movables;
     for (const StaticArgument& argument : scene.statics)
-        statics.push_back(base::InnerPath(Complete(argument.model)));
+        statics.push_back(ModelPath(session, argument.model));
     for (const MovableArgument& argument : scene.movables)
-        movables.push_back(base::InnerPath(Complete(argument.model)));
+        movables.push_back(ModelPath(session, argument.model));
     VtCOsgAssetManager::getInstance().preloadModels(statics, false);
     VtCOsgAssetManager::getInstance().preloadModels(movables, true);
 }
@@ -109,18 +124,18 @@ void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneAr
 {
     host::Progress& progress = *session.GetHost().GetProgress();
     progress.ConnectProgressActivity(loadingScene, session.GetHost().GetTexts().GetText(textLoadingScene), {});
-    PreloadModels(scene);
+    PreloadModels(session, scene);
     progress.SetProgresStepCount(loadingScene, static_cast<long>(scene.statics.size() + scene.movables.size()));
     for (const StaticArgument& argument : scene.statics)
     {
         progress.SetProgressDescription(loadingScene, base::Wide(argument.model.filename().string()));
-        BuildStatic(document, argument);
+        BuildStatic(session, document, argument);
         progress.StepProgressActivity(loadingScene);
     }
     for (const MovableArgument& argument : scene.movables)
     {
         progress.SetProgressDescription(loadingScene, base::Wide(argument.name));
-        BuildMovable(document, argument);
+        BuildMovable(session, document, argument);
         progress.StepProgressActivity(loadingScene);
     }
     progress.DisconnectProgressActivity(loadingScene);

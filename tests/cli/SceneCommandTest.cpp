@@ -173,6 +173,20 @@ TEST_F(SceneCommand, ACopyKeepsEverythingAndCopiesToItself)
     }
 }
 
+TEST_F(SceneCommand, AModelOfALibraryIsStoredAsOneByAnyName)
+{
+    std::filesystem::create_directories(folder.path / "library" / "Cars" / "$Box");
+    std::filesystem::rename(folder.path / "car.dae", folder.path / "library" / "Cars" / "$Box" / "Box.dae");
+    std::filesystem::create_directory_symlink(folder.path / "library", folder.path / "link");
+    const Environment libraries{{"PANORAMIC_CUSTOMER_OBJECTS", (folder.path / "library").string()}};
+    for (const char* model : {"library/Cars/$Box/Box.dae", "link/Cars/$Box/Box.dae"})
+    {
+        const Result result = Run({"scene", "new", "-o", "l.xml", "--static", model}, libraries);
+        EXPECT_EQ(result.status, 0) << result.error;
+        EXPECT_NE(Read("l.xml").find("%Customer_Objects%\\Cars\\$Box\\Box.dae"), std::string::npos) << model;
+    }
+}
+
 TEST_F(SceneCommand, InfoTellsRecordsModelsObserversAndViews)
 {
     WriteSceneWith("more.xml", Observer("Ride", 3, "Auto", "0 0 1") + Observer("Lost", 5, "Truck", "0 0 1"));
