@@ -136,8 +136,10 @@ void VtCOsgCameramanipulator::Release()
     offsetRotation = osg::Quat();
     eventAnchor = nullptr;
     eventCurrent = nullptr;
-    if (DrivesFreely())
+    // A click, or a pointer that leaves the pane, has moved nothing, and doesn't change the scene.
+    if (DrivesFreely() && moved)
         WriteBack();
+    moved = false;
 }
 
 void VtCOsgCameramanipulator::Record(const osgGA::GUIEventAdapter& event)
@@ -170,6 +172,7 @@ bool VtCOsgCameramanipulator::calcMovement()
 
     const bool freely = DrivesFreely();
     UpdateDeltas(eventCurrent->getX() - eventAnchor->getX(), eventCurrent->getY() - eventAnchor->getY(), freely);
+    moved = moved || deltaX != 0 || deltaY != 0;
     if (panMode)
         Pan(freely);
     else if (rollMode)

@@ -92,6 +92,7 @@ private:
     osg::ref_ptr<const osgGA::GUIEventAdapter> eventAnchor;
     osg::ref_ptr<const osgGA::GUIEventAdapter> eventCurrent;
     bool dragging = false;
+    bool moved = false; ///< since the press
     bool rollMode = false;
     bool panMode = false;
 };

@@ -189,11 +189,13 @@ TEST_F(Manipulator, AClickWithoutMotionMovesNothing)
     Use(*observers->GetFree1());
     manipulator->setByMatrix(facingNorth);
     const osg::Matrixd before = manipulator->getMatrix();
+    document.SetModified(false);
     Send(Event::PUSH, 5, 5);
     Send(Event::RELEASE);
+    Send(Event::RELEASE); // as when the pointer leaves the pane
     for (int k = 0; k < 16; ++k)
         EXPECT_NEAR(manipulator->getMatrix().ptr()[k], before.ptr()[k], 1e-6);
-    EXPECT_EQ((*observers->GetFree1()->GetAttributeObject()->Find<VtTFloatTupel3>(L"position"))[0], 10);
+    EXPECT_FALSE(document.modified) << "nothing to be saved";
 }
 
 TEST_F(Manipulator, OtherViewsOfTheObserverMoveAlong)
