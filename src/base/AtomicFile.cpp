@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -11,6 +12,9 @@ namespace base
 
 namespace
 {
+
+// Between the name and the random letters: no backup that a user made is taken for a temporary file.
+constexpr std::string_view temporaryMark = ".writing-";
 
 // mkstemp() makes files that only the owner reads; a picture or a run should have the rights that any new file has.
 mode_t UsualRights()
@@ -24,7 +28,7 @@ mode_t UsualRights()
 
 AtomicFile::AtomicFile(std::filesystem::path target) : path(std::move(target))
 {
-    std::string name = path.string() + ".XXXXXX";
+    std::string name = path.string() + std::string(temporaryMark) + "XXXXXX";
     file = mkstemp(name.data());
     if (file < 0)
     {
@@ -33,6 +37,7 @@ AtomicFile::AtomicFile(std::filesystem::path target) : path(std::move(target))
     }
     temporary = name;
     fchmod(file, UsualRights());
+    flock(file, LOCK_EX | LOCK_NB); // tells `RemoveAbandoned` that somebody writes; a killed process loses it
 }
 
 AtomicFile::~AtomicFile()
@@ -83,14 +88,31 @@ bool AtomicFile::Commit()
         return false;
     if (fsync(file) != 0)
         return Fail("");
-    const int closed = close(file);
-    file = -1;
-    if (closed != 0)
-        return Fail("");
-    if (rename(temporary.c_str(), path.c_str()) != 0)
+    if (rename(temporary.c_str(), path.c_str()) != 0) // still locked, so nobody takes it for abandoned
         return Fail("");
     temporary.clear();
-    return true;
+    const int closed = close(file);
+    file = -1;
+    return closed == 0 || Fail("");
+}
+
+void RemoveAbandoned(const std::filesystem::path& path)
+{
+    const std::string start = path.filename().string() + std::string(temporaryMark);
+    const std::filesystem::path folder = path.has_parent_path() ? path.parent_path() : ".";
+    std::error_code failed;
+    for (std::filesystem::directory_iterator at(folder, failed), end; !failed && at != end; at.increment(failed))
+    {
+        const std::string name = at->path().filename().string();
+        if (!name.starts_with(start) || name.size() != start.size() + 6)
+            continue;
+        const int left = open(at->path().c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC);
+        if (left < 0)
+            continue;
+        if (flock(left, LOCK_EX | LOCK_NB) == 0)
+            unlink(at->path().c_str());
+        close(left);
+    }
 }
 
 std::string WriteWholeFile(const std::filesystem::path& path, std::string_view content)

@@ -44,4 +44,8 @@ private:
 /// Writes `content` as the whole of `path`. Empty on success, else the reason with the path.
 std::string WriteWholeFile(const std::filesystem::path& path, std::string_view content);
 
+/// Removes the temporary files that writers of `path` have left behind when they were killed. One that is still being
+/// written stays.
+void RemoveAbandoned(const std::filesystem::path& path);
+
 } // namespace base

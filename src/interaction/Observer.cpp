@@ -165,7 +165,8 @@ void VtC3DObserver::Update()
 
 VtC3DObserver::Placement VtC3DObserver::FollowRigid(const osg::Matrixd& body) const
 {
-    const osg::Matrixd placed = osg::Matrixd::translate(offsetTranslation) * body;
+    osg::Matrixd placed = body;
+    placed.preMultTranslate(osg::Vec3d(offsetTranslation));
     return {osg::Vec3f(placed.getTrans()), placed.getRotate()};
 }
 
@@ -185,16 +186,26 @@ VtC3DObserver::Placement VtC3DObserver::LookAt(const osg::Matrixd& body) const
 
 void VtC3DObserver::Place(const Placement& placement)
 {
-    // Two quarter turns and a half one change from the axes of a body to those of a camera. The head turn of looking at
-    // a body takes the place of the offset about z.
-    const double z = followMode == followLookAt ? 0.0 : offsetAngles.z();
-    const osg::Matrixd axes = osg::Matrixd::rotate(base::RadiansFromDegrees(offsetAngles.x() + 90.0), zAxis,
-                                                   base::RadiansFromDegrees(offsetAngles.y() + 90.0), yAxis,
-                                                   base::RadiansFromDegrees(z + 180.0), zAxis);
-    const osg::Matrixd camera =
-        axes * osg::Matrixd::rotate(placement.rotation) * osg::Matrixd::translate(placement.position);
-    position = camera.getTrans();
+    // The head turn of looking at a body takes the place of the offset about z.
+    const osg::Vec3f angles(offsetAngles.x(), offsetAngles.y(), followMode == followLookAt ? 0.0f : offsetAngles.z());
+    osg::Matrixd camera = CameraAxes(angles) * osg::Matrixd::rotate(placement.rotation);
+    camera.setTrans(placement.position);
+    position = placement.position;
     setMatrix(osg::Matrixd::inverse(camera), true);
+}
+
+// Two quarter turns and a half one change from the axes of a body to those of a camera. They stay the same for many
+// frames, and their sines cost more than the rest of the placement.
+const osg::Matrixd& VtC3DObserver::CameraAxes(const osg::Vec3f& angles)
+{
+    if (!cameraAxes || axesAngles != angles)
+    {
+        cameraAxes = osg::Matrixd::rotate(base::RadiansFromDegrees(angles.x() + 90.0), zAxis,
+                                          base::RadiansFromDegrees(angles.y() + 90.0), yAxis,
+                                          base::RadiansFromDegrees(angles.z() + 180.0), zAxis);
+        axesAngles = angles;
+    }
+    return *cameraAxes;
 }
 
 void VtC3DObserver::setPosition(const osg::Vec3f& eye, bool update)

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -132,6 +133,7 @@ private:
     Placement FollowHeading(const osg::Matrixd& body) const;
     Placement LookAt(const osg::Matrixd& body) const;
     void Place(const Placement& placement);
+    const osg::Matrixd& CameraAxes(const osg::Vec3f& angles);
     void RebuildFreeView(bool update);
     void OnAttachedTo(const std::wstring& name);
     void ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key, float& number);
@@ -141,6 +143,8 @@ private:
     bool isFree = false;
     osg::Vec3f offsetAngles; ///< degrees about x, y, z
     osg::Vec3f offsetTranslation{0, 0, 1.5f};
+    std::optional<osg::Matrixd> cameraAxes; ///< those of the camera, for `axesAngles`
+    osg::Vec3f axesAngles;
     osg::Quat offsetRotation;
     osg::Quat orientation;
     osg::Matrixd viewMatrix;

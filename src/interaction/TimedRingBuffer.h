@@ -34,8 +34,16 @@ public:
 private:
     static constexpr std::int32_t capacity = 200;
 
+    struct Ring
+    {
+        std::array<VtCFollowData, capacity> entries;
+        std::array<std::int64_t, capacity> elapsed; ///< milliseconds since the first `Add`; in a row, for the search
+    };
+
+    std::int64_t ElapsedAt(std::uint32_t tick) const;
+
     const host::Clock& clock;
     std::int32_t writeIndex = 0;
     std::int32_t wrapCount = 0;
-    std::unique_ptr<std::array<VtCFollowData, capacity>> entries;
+    std::unique_ptr<Ring> ring;
 };

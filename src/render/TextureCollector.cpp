@@ -10,14 +10,23 @@
 
 void VtCOsgTextureCollector::apply(osg::Node& node)
 {
+    if (WasSeen(node))
+        return;
     Examine(node.getStateSet());
     traverse(node);
 }
 
 void VtCOsgTextureCollector::apply(osg::Geode& geode)
 {
+    if (WasSeen(geode))
+        return;
     for (unsigned i = 0; i < geode.getNumDrawables(); ++i)
         Examine(geode.getDrawable(i)->getStateSet());
+}
+
+bool VtCOsgTextureCollector::WasSeen(const osg::Node& node)
+{
+    return node.getNumParents() > 1 && !shared.insert(&node).second;
 }
 
 void VtCOsgTextureCollector::Examine(const osg::StateSet* state)

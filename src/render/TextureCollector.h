@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <unordered_set>
 #include <vector>
 
 #include <osg/NodeVisitor>
@@ -23,5 +24,8 @@ public:
     std::vector<std::wstring> fileNames; ///< each once, in order of first appearance
 
 private:
+    bool WasSeen(const osg::Node& node);
     void Examine(const osg::StateSet* state);
+
+    std::unordered_set<const osg::Node*> shared; ///< below several parents: hundreds of bodies may show one model
 };

@@ -107,8 +107,7 @@ void VtCGlidePanelAbstractNavigatorObject::ApplyAttributes(VtISceneObject& sourc
 
 osg::ref_ptr<VtISceneObject> VtCGlidePanelAbstractNavigatorObject::CopyAttributes(const VtISceneObject& source) const
 {
-    const VtISceneObjectStore& store = GetServices().store;
-    osg::ref_ptr<VtISceneObject> destination = store.ParseObject(store.GetDefaultText(source.GetObjectType())).object;
+    osg::ref_ptr<VtISceneObject> destination = GetServices().store.MakeDefaultObject(source.GetObjectType());
     if (destination)
         for (const osg::ref_ptr<VtISceneAttribute>& attribute : source.GetAttributes())
             if (VtISceneAttribute* copy = destination->GetAttribute(attribute->GetName()))

@@ -134,7 +134,7 @@ void VtC3DBody::MakeAttributeObject(const std::string& description, std::int32_t
             services.messages.ShowWarning(messageBadDescription, filePath, parsed.error);
     }
     if (!attributeObject)
-        attributeObject = services.store.ParseObject(services.store.GetDefaultText(objectType)).object;
+        attributeObject = services.store.MakeDefaultObject(objectType);
 }
 
 void VtC3DBody::AddMissingDyeAttributes()

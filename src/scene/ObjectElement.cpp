@@ -33,7 +33,7 @@ std::int32_t ReadType(const pugi::xml_node& node, const pugi::xml_attribute& typ
 }
 
 // Text may be interrupted by comments and CDATA sections; together they are one text.
-std::wstring ReadText(const pugi::xml_node& element)
+std::string ReadText(const pugi::xml_node& element)
 {
     std::string text;
     for (const pugi::xml_node& part : element.children())
@@ -43,24 +43,24 @@ std::wstring ReadText(const pugi::xml_node& element)
             RefuseContent(part);
     if (text.size() > largestValue)
         RefuseNode(element, "a value is larger than 16 MB");
-    return base::Wide(text);
+    return text;
 }
 
-VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const std::wstring& name)
+VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const VtTAttributeRules& rules)
 {
     const pugi::xml_attribute told = node.attribute("type");
     if (!told)
-        return AssumedAttributeType(name);
+        return rules.assumedType;
     const VtEAttributeType type = AttributeTypeFromName(base::Wide(told.value()));
-    const std::optional<VtEAttributeType> fixed = FixedAttributeType(name);
-    if (fixed && *fixed != type)
-        throw VtCAttributeError("its type is " + base::Utf8(AttributeTypeName(*fixed)) + ", not " + told.value());
+    if (rules.fixedType && *rules.fixedType != type)
+        throw VtCAttributeError("its type is " + base::Utf8(AttributeTypeName(*rules.fixedType)) + ", not " +
+                                told.value());
     return type;
 }
 
 VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
 {
-    std::vector<std::wstring> values;
+    std::vector<std::string> values;
     for (const pugi::xml_node& child : node.children())
         if (IsElement(child) && std::string_view(child.name()) == "vtattr:value")
             values.push_back(ReadText(child));
@@ -68,78 +68,63 @@ VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
             RefuseContent(child);
 
     if (type == VtEAttributeType::textList)
-        return values;
+    {
+        std::vector<std::wstring> texts;
+        for (const std::string& value : values)
+            texts.push_back(base::Wide(value));
+        return texts;
+    }
     if (values.size() != 1)
         throw VtCAttributeError("it has " + std::to_string(values.size()) + " values, not 1");
-    if (type == VtEAttributeType::text)
-        return std::move(values.front());
     return AttributeValueFromText(type, values.front());
 }
 
-void ReadAttribute(const pugi::xml_node& node, VtISceneObject& object)
-{
-    const std::wstring name = base::Wide(node.attribute("name").value());
-    if (name.empty())
-        RefuseNode(node, "an attribute has no name");
-    if (object.GetAttribute(name))
-        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\" is there twice");
-    if (object.GetAttributes().size() >= mostAttributes)
-        RefuseNode(node, "more than " + std::to_string(mostAttributes) + " attributes");
-    try
-    {
-        VtTAttributeValue value = ReadValue(node, ReadAttributeType(node, name));
-        const auto* list = std::get_if<std::vector<float>>(&value);
-        const std::optional<std::size_t> length = list ? FixedListLength(name) : std::nullopt;
-        if (length && list->size() != *length)
-            throw VtCAttributeError("it holds " + std::to_string(list->size()) + " numbers, not " +
-                                    std::to_string(*length));
-        object.AddAttribute(name, std::move(value));
-    }
-    catch (const VtCAttributeError& error)
-    {
-        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\": " + error.what());
-    }
-}
-
-void ReadAttributes(const pugi::xml_node& parent, VtISceneObject& object)
-{
-    for (const pugi::xml_node& node : parent.children())
-        if (IsElement(node) && std::string_view(node.name()) == "vtattr:Attribute")
-            ReadAttribute(node, object);
-        else if (IsElement(node) || IsLooseText(node))
-            RefuseContent(node);
-}
-
 // A carriage return stays one only as a reference: readers of XML make a line end of it. So do line ends in quotes.
-void AppendEscaped(std::string& text, std::wstring_view value, bool inQuotes)
+bool NeedsReference(char c, bool inQuotes)
 {
-    for (const char c : base::Utf8(value))
-        switch (c)
-        {
-        case '&':
-            text += "&amp;";
-            break;
-        case '<':
-            text += "&lt;";
-            break;
-        case '>':
-            text += "&gt;";
-            break;
-        case '"':
-            text += inQuotes ? "&quot;" : "\"";
-            break;
-        case '\0':
-            text += "\xEF\xBF\xBD";
-            break;
-        default:
-            if (static_cast<unsigned char>(c) < 0x20 && (inQuotes || (c != '\t' && c != '\n')))
-                text += "&#" + std::to_string(static_cast<int>(c)) + ';';
-            else
-                text += c;
-        }
+    if (static_cast<unsigned char>(c) < 0x20)
+        return inQuotes || (c != '\t' && c != '\n');
+    return c == '&' || c == '<' || c == '>' || (c == '"' && inQuotes);
 }
 
-void AppendValue(std::string& text, std::wstring_view value)
+void AppendReference(std::string& text, char c)
+{
+    switch (c)
+    {
+    case '&':
+        text += "&amp;";
+        break;
+    case '<':
+        text += "&lt;";
+        break;
+    case '>':
+        text += "&gt;";
+        break;
+    case '"':
+        text += "&quot;";
+        break;
+    case '\0':
+        text += "\xEF\xBF\xBD";
+        break;
+    default:
+        text += "&#" + std::to_string(static_cast<int>(c)) + ';';
+    }
+}
+
+void AppendEscaped(std::string& text, std::string_view value, bool inQuotes)
+{
+    for (auto at = value.begin(); at != value.end();)
+    {
+        const auto next = std::find_if(at, value.end(), [inQuotes](char c) { return NeedsReference(c, inQuotes); });
+        text.append(at, next);
+        if (next == value.end())
+            return;
+        AppendReference(text, *next);
+        at = next + 1;
+    }
+}
+
+void AppendValue(std::string& text, std::string_view value)
 {
     text += "<vtattr:value>";
     AppendEscaped(text, value, false);
@@ -184,14 +169,53 @@ void RefuseDocumentTypes(const pugi::xml_node& document)
             throw VtTTextFault{0, "a document type is not allowed"};
 }
 
-osg::ref_ptr<VtISceneObject> ReadObjectElement(const pugi::xml_node& element, const pugi::xml_node& parent,
-                                               bool isWhole)
+const VtTAttributeRules& VtCObjectReader::RulesOf(std::string_view name)
+{
+    const auto at = rules.find(name);
+    if (at != rules.end())
+        return at->second;
+    std::wstring wide = base::Wide(name);
+    VtTAttributeRules made{wide, FixedAttributeType(wide), AssumedAttributeType(wide), FixedListLength(wide)};
+    return rules.emplace(name, std::move(made)).first->second;
+}
+
+void VtCObjectReader::ReadAttribute(const pugi::xml_node& node, VtISceneObject& object)
+{
+    const VtTAttributeRules& rulesOfName = RulesOf(node.attribute("name").value());
+    if (rulesOfName.name.empty())
+        RefuseNode(node, "an attribute has no name");
+    if (object.GetAttribute(rulesOfName.name))
+        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\" is there twice");
+    if (object.GetAttributes().size() >= mostAttributes)
+        RefuseNode(node, "more than " + std::to_string(mostAttributes) + " attributes");
+    try
+    {
+        VtTAttributeValue value = ReadValue(node, ReadAttributeType(node, rulesOfName));
+        const auto* list = std::get_if<std::vector<float>>(&value);
+        const std::optional<std::size_t> length = list ? rulesOfName.fixedLength : std::nullopt;
+        if (length && list->size() != *length)
+            throw VtCAttributeError("it holds " + std::to_string(list->size()) + " numbers, not " +
+                                    std::to_string(*length));
+        object.AddAttribute(rulesOfName.name, std::move(value));
+    }
+    catch (const VtCAttributeError& error)
+    {
+        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\": " + error.what());
+    }
+}
+
+osg::ref_ptr<VtISceneObject> VtCObjectReader::Read(const pugi::xml_node& element, const pugi::xml_node& parent,
+                                                   bool isWhole)
 {
     osg::ref_ptr<VtISceneObject> object = new VtISceneObject;
     std::optional<std::int32_t> type;
     if (const pugi::xml_attribute told = element.attribute("type"))
         type = ReadType(element, told);
-    ReadAttributes(parent, *object);
+    for (const pugi::xml_node& node : parent.children())
+        if (IsElement(node) && std::string_view(node.name()) == "vtattr:Attribute")
+            ReadAttribute(node, *object);
+        else if (IsElement(node) || IsLooseText(node))
+            RefuseContent(node);
 
     if (isWhole && object->GetAttributes().empty())
         RefuseNode(element, "the object has no attributes");
@@ -215,13 +239,13 @@ void WriteObjectElement(std::string& text, const VtISceneObject& object, std::si
     for (const osg::ref_ptr<VtISceneAttribute>& attribute : object.GetAttributes())
     {
         text.append(indent + 2, ' ') += "<vtattr:Attribute name=\"";
-        AppendEscaped(text, attribute->GetName(), true);
-        text += "\" type=\"" + base::Utf8(attribute->GetTypeName()) + "\">";
+        AppendEscaped(text, base::Utf8(attribute->GetName()), true);
+        text.append("\" type=\"").append(base::Utf8(AttributeTypeName(attribute->GetType()))) += "\">";
         if (const auto* texts = std::get_if<std::vector<std::wstring>>(&attribute->GetValue()))
             for (const std::wstring& value : *texts)
-                AppendValue(text, value);
+                AppendValue(text, base::Utf8(value));
         else
-            AppendValue(text, attribute->GetValueText());
+            AppendValue(text, AttributeValueToUtf8(attribute->GetValue()));
         text += "</vtattr:Attribute>\n";
     }
     text.append(indent, ' ') += "</vtattr:Object>\n";

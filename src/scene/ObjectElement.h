@@ -1,8 +1,10 @@
 #pragma once
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <string_view>
+#include <unordered_map>
 
 #include <osg/ref_ptr>
 
@@ -41,11 +43,30 @@ void RefuseDocumentTypes(const pugi::xml_node& document);
 /// The first bytes of a text from outside, for a message.
 std::string Shortened(const char* text);
 
-/// The record whose attributes stand below `parent`. `element` is the `vtattr:Object` with its type, null for
-/// attributes without one. Without a type it is one of a static body; with
-/// `isWhole` it is refused, and so is a record without attributes.
-osg::ref_ptr<VtISceneObject> ReadObjectElement(const pugi::xml_node& element, const pugi::xml_node& parent,
-                                               bool isWhole);
+/// What the name of an attribute says by itself.
+struct VtTAttributeRules
+{
+    std::wstring name;
+    std::optional<VtEAttributeType> fixedType;
+    VtEAttributeType assumedType; ///< when the text tells none
+    std::optional<std::size_t> fixedLength;
+};
+
+/// Reads the records of one document, which outlives this.
+class VtCObjectReader
+{
+public:
+    /// The record whose attributes stand below `parent`. `element` is the `vtattr:Object` with its type, null for
+    /// attributes without one. Without a type it is one of a static body; with `isWhole` it is refused, and so is a
+    /// record without attributes.
+    osg::ref_ptr<VtISceneObject> Read(const pugi::xml_node& element, const pugi::xml_node& parent, bool isWhole);
+
+private:
+    void ReadAttribute(const pugi::xml_node& node, VtISceneObject& object);
+    const VtTAttributeRules& RulesOf(std::string_view name);
+
+    std::unordered_map<std::string_view, VtTAttributeRules> rules; ///< keys lie in the document
+};
 
 /// Appends the element of `object`, indented by `indent` blanks, with the declaration of the namespace if asked for.
 void WriteObjectElement(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace);

@@ -26,11 +26,11 @@ osg::ref_ptr<VtISceneObject> ReadObject(const pugi::xml_document& document)
     if (!root)
         throw VtTTextFault{0, "there is no element"};
     if (std::string_view(root.name()) != objectElementName)
-        return ReadObjectElement({}, document, false);
+        return VtCObjectReader().Read({}, document, false);
     for (pugi::xml_node next = root.next_sibling(); next; next = next.next_sibling())
         if (IsElement(next))
             RefuseContent(next);
-    return ReadObjectElement(root, root, false);
+    return VtCObjectReader().Read(root, root, false);
 }
 
 } // namespace

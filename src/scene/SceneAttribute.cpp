@@ -4,9 +4,11 @@
 #include "base/Text.h"
 #include "scene/SceneObject.h"
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <optional>
+#include <unordered_set>
 #include <utility>
 
 namespace
@@ -50,12 +52,12 @@ float RealFromText(std::string_view text)
 template <class Take>
 void ForEachWord(std::string_view text, Take take)
 {
-    constexpr std::string_view blanks = " \t\r\n";
-    for (std::size_t begin = text.find_first_not_of(blanks); begin != std::string_view::npos;)
+    const auto isBlank = [](char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; };
+    for (auto begin = std::find_if_not(text.begin(), text.end(), isBlank); begin != text.end();)
     {
-        const std::size_t end = text.find_first_of(blanks, begin);
-        take(text.substr(begin, end == std::string_view::npos ? end : end - begin));
-        begin = text.find_first_not_of(blanks, end);
+        const auto end = std::find_if(begin, text.end(), isBlank);
+        take(std::string_view(begin, end));
+        begin = std::find_if_not(end, text.end(), isBlank);
     }
 }
 
@@ -77,13 +79,38 @@ Tuple TupleFromText(std::string_view text, Convert convert)
 }
 
 template <class Numbers, class Format>
-std::wstring NumbersToText(const Numbers& numbers, Format format)
+std::string NumbersToText(const Numbers& numbers, Format format)
 {
     std::string text;
     for (const auto number : numbers)
         (text.empty() ? text : text += ' ') += format(number);
-    return base::Wide(text);
+    return text;
 }
+
+std::wstring Lines(const std::vector<std::wstring>& texts)
+{
+    std::wstring lines;
+    for (std::size_t i = 0; i < texts.size(); ++i)
+        (i == 0 ? lines : lines += L'\n') += texts[i];
+    return lines;
+}
+
+struct ToUtf8
+{
+    std::string operator()(std::int32_t number) const { return std::to_string(number); }
+    std::string operator()(float number) const { return base::FormatFloat(number); }
+    std::string operator()(const std::wstring& text) const { return base::Utf8(text); }
+    std::string operator()(const VtTFloatTupel3& numbers) const { return NumbersToText(numbers, base::FormatFloat); }
+    std::string operator()(const VtTIntTupel3& numbers) const
+    {
+        return NumbersToText(numbers, [](std::int32_t number) { return std::to_string(number); });
+    }
+    std::string operator()(const std::vector<float>& numbers) const
+    {
+        return NumbersToText(numbers, base::FormatFloat);
+    }
+    std::string operator()(const std::vector<std::wstring>& texts) const { return base::Utf8(Lines(texts)); }
+};
 
 struct IsFinite
 {
@@ -112,6 +139,18 @@ void CheckFinite(const std::wstring& name, const VtTAttributeValue& value)
         Refuse("attribute " + Quoted(base::Utf8(name)) + " takes finite numbers only");
 }
 
+// All records share a few names, which take more room than most values. Null once there are too many of them: names
+// come from files too.
+const std::wstring* CommonName(const std::wstring& name)
+{
+    constexpr std::size_t mostNames = 500;
+    static std::unordered_set<std::wstring> names;
+    const auto at = names.find(name);
+    if (at != names.end())
+        return &*at;
+    return names.size() < mostNames ? &*names.insert(name).first : nullptr;
+}
+
 } // namespace
 
 std::wstring_view AttributeTypeName(VtEAttributeType type)
@@ -136,63 +175,58 @@ VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::wstring_vie
     case VtEAttributeType::textList:
         return base::Split(text, L'\n');
     default:
-        break;
+        return AttributeValueFromText(type, base::Utf8(text));
     }
+}
 
-    const std::string narrow = base::Utf8(text);
+VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::string_view text)
+{
     switch (type)
     {
+    case VtEAttributeType::text:
+        return base::Wide(text);
+    case VtEAttributeType::textList:
+        return base::Split(base::Wide(text), L'\n');
     case VtEAttributeType::integer:
-        return IntegerFromText(narrow);
+        return IntegerFromText(text);
     case VtEAttributeType::real:
-        return RealFromText(narrow);
+        return RealFromText(text);
     case VtEAttributeType::floatTupel3:
-        return TupleFromText<VtTFloatTupel3>(narrow, RealFromText);
+        return TupleFromText<VtTFloatTupel3>(text, RealFromText);
     case VtEAttributeType::intTupel3:
-        return TupleFromText<VtTIntTupel3>(narrow, IntegerFromText);
+        return TupleFromText<VtTIntTupel3>(text, IntegerFromText);
     default:
         std::vector<float> list;
-        ForEachWord(narrow, [&](std::string_view word) { list.push_back(RealFromText(word)); });
+        ForEachWord(text, [&](std::string_view word) { list.push_back(RealFromText(word)); });
         return list;
     }
 }
 
 std::wstring AttributeValueToText(const VtTAttributeValue& value)
 {
-    struct ToText
-    {
-        std::wstring operator()(std::int32_t number) const { return std::to_wstring(number); }
-        std::wstring operator()(float number) const { return base::Wide(base::FormatFloat(number)); }
-        std::wstring operator()(const std::wstring& text) const { return text; }
-        std::wstring operator()(const VtTFloatTupel3& numbers) const
-        {
-            return NumbersToText(numbers, base::FormatFloat);
-        }
-        std::wstring operator()(const VtTIntTupel3& numbers) const
-        {
-            return NumbersToText(numbers, [](std::int32_t number) { return std::to_string(number); });
-        }
-        std::wstring operator()(const std::vector<float>& numbers) const
-        {
-            return NumbersToText(numbers, base::FormatFloat);
-        }
-        std::wstring operator()(const std::vector<std::wstring>& texts) const
-        {
-            std::wstring lines;
-            for (std::size_t i = 0; i < texts.size(); ++i)
-                (i == 0 ? lines : lines += L'\n') += texts[i];
-            return lines;
-        }
-    };
-    return std::visit(ToText(), value);
+    if (const auto* text = std::get_if<std::wstring>(&value))
+        return *text;
+    if (const auto* texts = std::get_if<std::vector<std::wstring>>(&value))
+        return Lines(*texts);
+    return base::Wide(AttributeValueToUtf8(value));
 }
 
-VtISceneAttribute::VtISceneAttribute(std::wstring attributeName, VtTAttributeValue attributeValue)
-    : name(std::move(attributeName)), value(std::move(attributeValue))
+std::string AttributeValueToUtf8(const VtTAttributeValue& value)
 {
-    if (name.empty())
+    return std::visit(ToUtf8(), value);
+}
+
+VtISceneAttribute::VtISceneAttribute(const std::wstring& attributeName, VtTAttributeValue attributeValue)
+    : name(CommonName(attributeName)), value(std::move(attributeValue))
+{
+    if (attributeName.empty())
         Refuse("an attribute needs a name");
-    CheckFinite(name, value);
+    if (!name)
+    {
+        ownName = std::make_unique<const std::wstring>(attributeName);
+        name = ownName.get();
+    }
+    CheckFinite(*name, value);
 }
 
 void VtISceneAttribute::SetValue(VtTAttributeValue newValue)
@@ -201,11 +235,11 @@ void VtISceneAttribute::SetValue(VtTAttributeValue newValue)
     {
         const std::int32_t* integer = std::get_if<std::int32_t>(&newValue);
         if (!integer || GetType() != VtEAttributeType::real)
-            Refuse("attribute " + Quoted(base::Utf8(name)) + " is of type " + base::Utf8(GetTypeName()) +
+            Refuse("attribute " + Quoted(base::Utf8(*name)) + " is of type " + base::Utf8(GetTypeName()) +
                    " and takes no " + base::Utf8(typeNames[newValue.index()]));
         newValue = static_cast<float>(*integer);
     }
-    CheckFinite(name, newValue);
+    CheckFinite(*name, newValue);
     if (value == newValue)
         return;
 

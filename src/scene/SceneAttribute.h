@@ -2,6 +2,7 @@
 
 #include <array>
 #include <cstdint>
+#include <memory>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -47,16 +48,20 @@ VtEAttributeType AttributeTypeFromName(std::wstring_view typeName);
 /// a list of texts has one entry a line. Throws `VtCAttributeError` when `text` isn't such a value.
 VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::wstring_view text);
 
+/// The same for a text in UTF-8.
+VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::string_view text);
+
 /// The text that reads back as the same value; a list of texts only when no entry holds a line end.
 std::wstring AttributeValueToText(const VtTAttributeValue& value);
+std::string AttributeValueToUtf8(const VtTAttributeValue& value);
 
 /// One named value of a record. The type is fixed when it is made.
 class VtISceneAttribute : public osg::Referenced
 {
 public:
-    VtISceneAttribute(std::wstring attributeName, VtTAttributeValue attributeValue);
+    VtISceneAttribute(const std::wstring& attributeName, VtTAttributeValue attributeValue);
 
-    const std::wstring& GetName() const { return name; }
+    const std::wstring& GetName() const { return *name; }
     VtEAttributeType GetType() const { return static_cast<VtEAttributeType>(value.index()); }
     std::wstring GetTypeName() const { return std::wstring(AttributeTypeName(GetType())); }
     const VtTAttributeValue& GetValue() const { return value; }
@@ -71,7 +76,8 @@ public:
 private:
     friend class VtISceneObject;
 
-    std::wstring name;
+    const std::wstring* name;                    ///< the copy that all attributes of a common name share, or `ownName`
+    std::unique_ptr<const std::wstring> ownName; ///< null for a common name
     VtTAttributeValue value;
     VtISceneObject* owner = nullptr; ///< null once the record has let it go
 };

@@ -51,6 +51,12 @@ void CheckEncoding(std::string_view text)
         Refuse(0, "the text is UTF-16 or UTF-32, not UTF-8");
     for (std::size_t at = 0; at < text.size();)
     {
+        // Nearly all of a file; byte by byte through the rules it would cost as much as the parsing.
+        if (static_cast<signed char>(text[at]) > 0)
+        {
+            ++at;
+            continue;
+        }
         const std::size_t length = SequenceLength(text, at);
         if (length == 0)
             Refuse(at, text[at] == '\0' ? "there is a byte 0" : "the text is not UTF-8");
@@ -86,7 +92,10 @@ private:
 
         const bool closes = rest.starts_with("</");
         const std::size_t nameAt = at + (closes ? 2 : 1);
-        const std::size_t nameEnd = std::min(text.find_first_of(" \t\r\n/>", nameAt), text.size());
+        const auto endsName = [](char c)
+        { return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '/' || c == '>'; };
+        const auto nameEnd = static_cast<std::size_t>(
+            std::find_if(text.begin() + static_cast<std::ptrdiff_t>(nameAt), text.end(), endsName) - text.begin());
         const std::string_view name = text.substr(nameAt, nameEnd - nameAt);
         if (std::find(std::begin(elementNames), std::end(elementNames), name) == std::end(elementNames))
             Refuse(at, "element <" + Shortened(std::string(name.substr(0, 100)).c_str()) + "> is not expected here");
@@ -229,11 +238,12 @@ void ReadScene(std::string_view text, std::vector<osg::ref_ptr<VtISceneObject>>&
     if (!result)
         throw VtTTextFault{result.offset, result.description()};
 
+    VtCObjectReader reader;
     RecordCheck check(text);
     for (const pugi::xml_node& node : FindScene(document).children())
         if (IsElement(node) && std::string_view(node.name()) == objectElementName)
         {
-            objects.push_back(ReadObjectElement(node, node, true));
+            objects.push_back(reader.Read(node, node, true));
             check.Add(*objects.back(), node.offset_debug());
         }
         else if (IsElement(node) || IsLooseText(node))
@@ -266,7 +276,10 @@ VtTSceneRecords ParseSceneText(std::string_view text)
 
 std::string WriteSceneText(const std::vector<osg::ref_ptr<VtISceneObject>>& objects)
 {
-    std::string text = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<vtattr:Scene xmlns:vtattr=\"";
+    constexpr std::size_t usualRecord = 2500; // bytes
+    std::string text;
+    text.reserve((objects.size() + 1) * usualRecord);
+    text = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<vtattr:Scene xmlns:vtattr=\"";
     text += attributesNamespace;
     text.append("\" version=\"").append(sceneVersion) += "\">\n";
     for (const osg::ref_ptr<VtISceneObject>& object : objects)

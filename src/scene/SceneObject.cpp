@@ -3,6 +3,20 @@
 #include <algorithm>
 #include <utility>
 
+namespace
+{
+
+// Most records have some twenty attributes. A table by name pays for the few that have thousands.
+constexpr std::size_t fewAttributes = 40;
+constexpr std::size_t usualAttributes = 24;
+
+} // namespace
+
+VtISceneObject::VtISceneObject(std::int32_t objectType) : type(objectType)
+{
+    attributes.reserve(usualAttributes);
+}
+
 VtISceneObject::~VtISceneObject()
 {
     for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
@@ -11,8 +25,24 @@ VtISceneObject::~VtISceneObject()
 
 VtISceneAttribute* VtISceneObject::GetAttribute(std::wstring_view name) const
 {
+    if (byName.empty())
+    {
+        for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
+            if (attribute->GetName() == name)
+                return attribute.get();
+        return nullptr;
+    }
     const auto at = byName.find(name);
     return at == byName.end() ? nullptr : at->second;
+}
+
+void VtISceneObject::Index()
+{
+    if (!byName.empty())
+        byName.emplace(attributes.back()->GetName(), attributes.back().get());
+    else if (attributes.size() > fewAttributes)
+        for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
+            byName.emplace(attribute->GetName(), attribute.get());
 }
 
 void VtISceneObject::AddAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name)
@@ -26,23 +56,25 @@ void VtISceneObject::AddAttribute(const std::wstring& name, VtTAttributeValue va
     attribute->owner = this;
     if (VtISceneAttribute* old = GetAttribute(name))
     {
-        byName.erase(old->GetName());
         old->owner = nullptr;
+        if (byName.erase(name) > 0)
+            byName.emplace(attribute->GetName(), attribute.get());
         *std::find(attributes.begin(), attributes.end(), old) = attribute;
     }
     else
+    {
         attributes.push_back(attribute);
-    byName.emplace(attribute->GetName(), attribute.get());
+        Index();
+    }
     Fire(*attribute);
 }
 
 void VtISceneObject::RemoveAttribute(std::wstring_view name)
 {
-    const auto at = byName.find(name);
-    if (at == byName.end())
+    VtISceneAttribute* attribute = GetAttribute(name);
+    if (!attribute)
         return;
-    VtISceneAttribute* attribute = at->second;
-    byName.erase(at);
+    byName.erase(name);
     attribute->owner = nullptr;
     attributes.erase(std::find(attributes.begin(), attributes.end(), attribute));
 }

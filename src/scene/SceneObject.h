@@ -27,7 +27,7 @@ class VtISceneObject : public osg::Referenced
 public:
     using Attributes = std::vector<osg::ref_ptr<VtISceneAttribute>>;
 
-    explicit VtISceneObject(std::int32_t objectType = 0) : type(objectType) {}
+    explicit VtISceneObject(std::int32_t objectType = 0);
 
     /// What kind of object the record describes: 0 atmospherics, 1 window layout, 2 render settings, 3 view,
     /// 4 instrument, 5 observer, 6 static body, 7 movable body, 8 track, 9 default observer.
@@ -69,11 +69,12 @@ protected:
 private:
     friend class VtISceneAttribute;
 
+    void Index();
     void Fire(VtISceneAttribute& attribute);
 
     std::int32_t type;
     Attributes attributes;
-    std::unordered_map<std::wstring_view, VtISceneAttribute*> byName; ///< keys are the attributes' own names
+    std::unordered_map<std::wstring_view, VtISceneAttribute*> byName; ///< all, or none while they are few
     std::vector<IPropertyChangedCOMEvents*> listeners;                ///< null: left while being told
     int firing = 0;
 };

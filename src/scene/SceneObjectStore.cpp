@@ -8,10 +8,13 @@
 #include "scene/RecordTables.h"
 #include "scene/SceneFileText.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <cstdint>
 #include <cstring>
 #include <fstream>
 #include <string>
+#include <unordered_set>
 
 namespace
 {
@@ -25,6 +28,9 @@ std::string ReadWhole(const std::filesystem::path& path, std::string& content)
     std::ifstream file(path, std::ios::binary);
     if (!file)
         return std::strerror(errno);
+    // Without a size (a pipe), or with a wrong one, it grows as it is read.
+    const std::uintmax_t size = std::filesystem::file_size(path, failure);
+    content.reserve(failure ? 0 : static_cast<std::size_t>(std::min<std::uintmax_t>(size, largestSceneText)) + 1);
     char part[1 << 16];
     while (content.size() <= largestSceneText && (file.read(part, sizeof part) || file.gcount() > 0))
         content.append(part, static_cast<std::size_t>(file.gcount()));
@@ -89,6 +95,11 @@ std::wstring VtCSceneObjectStore::GetDefaultText(std::int32_t objectType) const
     return object ? WriteObjectText(*object) : std::wstring();
 }
 
+osg::ref_ptr<VtISceneObject> VtCSceneObjectStore::MakeDefaultObject(std::int32_t objectType) const
+{
+    return ::MakeDefaultObject(objectType);
+}
+
 bool VtCSceneObjectStore::LoadFile(const std::wstring& path)
 {
     ReadFile(path, {});
@@ -125,8 +136,41 @@ std::vector<osg::ref_ptr<VtISceneObject>> VtCSceneObjectStore::ReadFile(const st
 
 bool VtCSceneObjectStore::SaveFile(const std::wstring& path)
 {
-    fileError = base::Wide(base::WriteWholeFile(base::NativePath(path), WriteSceneText(GetObjects())));
+    PartIds();
+    const std::filesystem::path file = base::NativePath(path);
+    fileError = base::Wide(base::WriteWholeFile(file, WriteSceneText(GetObjects())));
+    if (fileError.empty())
+        base::RemoveAbandoned(file);
     return fileError.empty();
+}
+
+// The attribute can be edited, the key that an object is stored under can't. So the first of those that share an id
+// keeps it, unless an object lives under it, and the others get back their own.
+void VtCSceneObjectStore::PartIds()
+{
+    const auto idOf = [](const VtISceneObject& object) -> const std::wstring&
+    {
+        static const std::wstring none;
+        const auto* id = object.Find<std::wstring>(L"internal_id");
+        return id ? *id : none;
+    };
+    const auto isKept = [&](const std::wstring& key)
+    {
+        const auto at = byId.find(key);
+        return at != byId.end() && base::EqualsNoCase(idOf(*at->second->second), key);
+    };
+
+    std::unordered_set<std::wstring> edited;
+    for (const auto& [key, object] : records)
+    {
+        const std::wstring& id = idOf(*object);
+        if (id.empty() || base::EqualsNoCase(id, key))
+            continue;
+        const std::wstring lower = base::ToLower(id);
+        if (!isKept(lower) && edited.insert(lower).second)
+            continue;
+        object->Write(L"internal_id", edited.contains(key) ? base::NewId() : key);
+    }
 }
 
 void VtCSceneObjectStore::RefreshObjects(const std::vector<std::wstring>& ids)

@@ -53,6 +53,9 @@ public:
     /// The textual form of a new record of that type; empty for a type that has no default record.
     virtual std::wstring GetDefaultText(std::int32_t objectType) const = 0;
 
+    /// The record that this text stands for, without the way through the text; null for a type that has none.
+    virtual osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType) const = 0;
+
     // Scene files (docs/scene-file.md). Paths in the inner form.
 
     /// Which records of a file come in; none stands for all.
@@ -65,7 +68,9 @@ public:
     /// The same, with the records as the result; empty when the file can't be read.
     virtual std::vector<osg::ref_ptr<VtISceneObject>> ReadFile(const std::wstring& path, const Wanted& wanted) = 0;
 
-    /// Writes all records. The file changes whole or not at all; false when it can't be written.
+    /// Writes all records. The file changes whole or not at all; false when it can't be written. Of several records
+    /// that were given one `internal_id` only the one that is stored under it keeps it, for a file with both could not
+    /// be read again. What saves of this file that were killed have left in its folder goes.
     virtual bool SaveFile(const std::wstring& path) = 0;
 
     /// Why the last of these three failed: "scene.xml, line 3: ..."; empty when it didn't.
@@ -86,6 +91,7 @@ public:
     void Clear() override;
     void AddObject(const std::wstring& id, VtISceneObject* object) override;
     std::wstring GetDefaultText(std::int32_t objectType) const override;
+    osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType) const override;
     bool LoadFile(const std::wstring& path) override;
     std::vector<osg::ref_ptr<VtISceneObject>> ReadFile(const std::wstring& path, const Wanted& wanted) override;
     bool SaveFile(const std::wstring& path) override;
@@ -96,6 +102,8 @@ public:
     void SetPropertyGrid(VtIPropertyGrid* propertyGrid) { grid = propertyGrid; }
 
 private:
+    void PartIds();
+
     using Records = std::list<std::pair<std::wstring, osg::ref_ptr<VtISceneObject>>>;
 
     Records records;

@@ -79,6 +79,9 @@ void VtC3DStaticBody::FillAttributes(const osg::Matrixd& insertTransform)
 
 void VtC3DStaticBody::UpdateBaseTransform()
 {
+    // A stored record sets fifteen values one after another; its loader asks for the result at the end.
+    if (IsLoading())
+        return;
     const osg::Matrixd turn = osg::Matrixd::rotate(RotationFromEuler(rotation.x(), rotation.y(), rotation.z()));
     const osg::Matrixd scaleTurn =
         osg::Matrixd::rotate(RotationFromEuler(scaleOrientation.x(), scaleOrientation.y(), scaleOrientation.z()));

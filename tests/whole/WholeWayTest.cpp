@@ -3,7 +3,6 @@
 #include <osg/Geode>
 #include <osg/ShapeDrawable>
 
-#include "app/PanoramicApp.h"
 #include "app/PanoramicDocument.h"
 #include "base/Paths.h"
 #include "hosts/common/EglGraphics.h"
@@ -15,6 +14,7 @@
 #include "simdata/points/MotionDataReader.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationDataRouter.h"
+#include "tests/support/AppStages.h"
 #include "tests/support/FakeHost.h"
 
 namespace
@@ -28,12 +28,7 @@ protected:
     {
         host.graphics = &graphics;
         host.paths.module = base::InnerPath(PANORAMIC_BIN) + L"\\";
-        app.InitInstance();
-        app.Connect();
-        app.ConnectToOtherComponents();
-        app.InsertGUIElements();
-        app.StartupCompleted();
-        app.FinalizeInitialization();
+        fake::StartApplication(app);
         document = dynamic_cast<VtCPanoramicDocument*>(host.documentManager.NewDocument());
     }
 
@@ -43,11 +38,7 @@ protected:
             removeViewFromViewer(view.get());
         view = nullptr;
         host.documentManager.CloseActiveDocument();
-        std::int32_t answer = 0;
-        app.StartShutdown(answer);
-        app.RemoveGUIElements();
-        app.RemoveComponentConnections();
-        app.Disconnect();
+        fake::StopApplication(app);
     }
 
     // A red box of 4 x 2 x 1 m that follows the first channel.

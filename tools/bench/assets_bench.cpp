@@ -1,9 +1,6 @@
 // Models: building a scene over a few of them, and what reading one costs by each way.
-#include <filesystem>
 #include <stdexcept>
 #include <string>
-#include <unistd.h>
-#include <vector>
 
 #include <benchmark/benchmark.h>
 #include <osg/Version>
@@ -14,15 +11,15 @@
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"
-#include "tests/support/FakeScene.h"
+#include "tools/bench/ExampleModels.h"
 
-namespace fs = std::filesystem;
+using namespace bench;
 
 namespace
 {
 
 constexpr int bodyCount = 1000;
-const char* const modelFiles[] = {
+const ModelList modelFiles = {
     "Vehicles/$Sedan/Sedan.dae",    "Vehicles/$Wheel/Wheel.dae",    "Buildings/$Hall/Hall.dae",
     "Buildings/$House/House.dae",   "Buildings/$Office/Office.dae", "Buildings/$WaterTower/WaterTower.wrl",
     "Roadside/$Gantry/Gantry.dae",  "Roadside/$Lamp/Lamp.dae",      "Landscape/$Oak/Oak.dae",
@@ -30,75 +27,9 @@ const char* const modelFiles[] = {
 };
 const char* const largeModel = "Vehicles/$Sedan/Sedan.dae";
 
-fs::path ProgramFolder()
-{
-    return fs::read_symlink("/proc/self/exe").parent_path();
-}
-
-fs::path ModelPath(const char* file)
-{
-    const fs::path path = ProgramFolder().parent_path() / "share/panoramic/example/Vantor Objects/advanced" / file;
-    if (!fs::exists(path))
-        throw std::runtime_error("the example's model " + path.string() + " is missing");
-    return path;
-}
-
-/// A folder for finished models that goes with the program.
-class CacheFolder
-{
-public:
-    CacheFolder() : path(fs::temp_directory_path() / ("panoramic_bench_models." + std::to_string(getpid()))) {}
-    ~CacheFolder() { fs::remove_all(path); }
-
-    const fs::path path;
-};
-
-/// The services that a scene needs, with the real models.
-class Document : public VtISceneDocument
-{
-public:
-    explicit Document(bool cached)
-    {
-        static const CacheFolder cache;
-        VtTModelReaderSettings settings =
-            VtTModelReaderSettings::FromEnvironment(ProgramFolder() / "panoramic-model-reader");
-        settings.cacheFolder = cached ? cache.path : fs::path();
-        VtCOsgAssetManager::destroyInstance();
-        VtCOsgAssetManager::setServices({&paths, &messages, settings});
-        for (const char* file : modelFiles)
-            models.push_back(base::InnerPath(ModelPath(file)));
-    }
-    ~Document() override { VtCOsgAssetManager::destroyInstance(); }
-
-    VtCScene3D* GetScene() const override { return scene; }
-    void SetScene(VtCScene3D* newScene) override { scene = newScene; }
-    void SetModified(bool) override {}
-    VtTSceneServices& GetServices() override { return services; }
-
-    /// One read of each model by a manager that has none.
-    void ReadModels()
-    {
-        VtCOsgAssetManager::destroyInstance();
-        for (const std::wstring& model : models)
-            if (VtCOsgAssetManager::getInstance().loadModel(model, true)->getNumChildren() == 0)
-                throw std::runtime_error("a model of the example can't be read");
-    }
-
-    fake::LibraryPaths paths;
-    fake::MessageHandler messages;
-    VtCSceneObjectStore store;
-    fake::Texts texts;
-    fake::ChannelSource channels;
-    fake::Configuration configuration;
-    VtTSceneServices services{store,         VtCOsgAssetManager::getLibrary(), paths, texts, messages, &channels,
-                              &configuration};
-    VtCScene3D* scene = nullptr;
-    std::vector<std::wstring> models;
-};
-
 void BuildScene(benchmark::State& state, bool cached)
 {
-    Document document(cached);
+    ModelDocument document(modelFiles, cached);
     document.ReadModels(); // fills the disk cache, if there is one
     for (auto _ : state)
     {
@@ -120,7 +51,7 @@ void BuildScene(benchmark::State& state, bool cached)
 
 void ReadModels(benchmark::State& state, bool cached)
 {
-    Document document(cached);
+    ModelDocument document(modelFiles, cached);
     document.ReadModels();
     for (auto _ : state)
         document.ReadModels();
@@ -128,7 +59,7 @@ void ReadModels(benchmark::State& state, bool cached)
 
 void PreloadModels(benchmark::State& state)
 {
-    Document document(false);
+    ModelDocument document(modelFiles, false);
     for (auto _ : state)
     {
         VtCOsgAssetManager::destroyInstance();
@@ -140,7 +71,7 @@ void PreloadModels(benchmark::State& state)
 
 void ReadOne(benchmark::State& state, bool cached)
 {
-    Document document(cached);
+    ModelDocument document(modelFiles, cached);
     const std::wstring model = base::InnerPath(ModelPath(largeModel));
     VtCOsgAssetManager::getInstance().readModel(model, true);
     for (auto _ : state)

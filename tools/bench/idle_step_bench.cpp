@@ -10,7 +10,6 @@
 #include <osg/ShapeDrawable>
 #include <osgViewer/CompositeViewer>
 
-#include "app/PanoramicApp.h"
 #include "app/PanoramicDocument.h"
 #include "hosts/common/EglGraphics.h"
 #include "hosts/common/OffscreenWindow.h"
@@ -20,6 +19,7 @@
 #include "simdata/points/SimulationDataPoint.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationDataRouter.h"
+#include "tests/support/AppStages.h"
 #include "tests/support/FakeHost.h"
 #include "tests/support/HeapCount.h"
 
@@ -93,12 +93,7 @@ public:
     Stage()
     {
         host.graphics = &graphics;
-        app.InitInstance();
-        app.Connect();
-        app.ConnectToOtherComponents();
-        app.InsertGUIElements();
-        app.StartupCompleted();
-        app.FinalizeInitialization();
+        fake::StartApplication(app);
         document = dynamic_cast<VtCPanoramicDocument*>(host.documentManager.NewDocument());
 
         const osg::ref_ptr<osg::Group> model = MakeModel();
@@ -137,11 +132,7 @@ public:
             view = nullptr;
         }
         host.documentManager.CloseActiveDocument();
-        std::int32_t answer = 0;
-        app.StartShutdown(answer);
-        app.RemoveGUIElements();
-        app.RemoveComponentConnections();
-        app.Disconnect();
+        fake::StopApplication(app);
     }
 
     void Step()

@@ -20,6 +20,11 @@ ROWS = {
     "build_scene": ("scene of 1000 bodies over 10 models", "reading the 10 models once", 2.0),
     "preload_models": ("10 models read at once", "one after another", 1.2),
     "read_model": ("a model read in a process of its own", "library's reader in this process", 12.0),
+    "update_observers": ("Update of 100 observers in smooth follow", "100 matrix products and inverses", 8.0),
+    "load_scene": ("loading a scene file, 1000 bodies over 10 models", "the same scene built by the program", 1.5),
+    "save_scene": ("saving that scene", "one write of the same bytes, and fsync", 3.0),
+    "load_records": ("loading a scene file of 10,000 records", "the same with 1,000", 12.0),
+    "four_panes": ("one frame of the example in four panes", "bare viewer frame, same graph and cameras", 1.10),
     "read_model_cached": ("a finished model taken from the cache", "library's reader in this process", 0.5),
 }
 

@@ -20,9 +20,10 @@ from comparison import compare_folders, shader_difference
 from course import Course
 from images import write_png
 from models import write_collada, write_vrml
-from run import write_csv, write_run
+from run import CHANNELS, write_csv, write_run
 from scene import PICTURES, library, placements, road_description, static_argument
-from shots import write_shots
+from scene_file import write_scene
+from shots import write_pane_shots, write_shots
 from terrain import Terrain
 
 SHARE = Path(__file__).resolve().parents[2] / "share" / "panoramic"
@@ -46,17 +47,18 @@ def make(folder: Path, say=print) -> None:
                 write_png(folder / entry.folder / material.texture, pictures[name])
     (folder / entries["Course"].folder / "Imported.xml").write_text(road_description(), encoding="utf-8")
 
-    say("  run.mdf, example.csv, example.shots")
+    say("  example.xml, example.args, run.mdf, example.csv, example.shots, panes.shots")
     write_run(course, folder / "run.mdf")
     write_csv(course, folder / "example.csv")
     write_shots(course, folder / "example.shots")
+    write_pane_shots(folder / "panes.shots")
+    standing = placements(course, terrain)
+    write_scene(entries, standing, folder / "example.xml")
     lines = []
-    for placed in placements(course, terrain):
+    for placed in standing:
         lines += ["--static", static_argument(entries[placed.name], placed)]
-    for vehicle in ("Sedan", "Van"):
-        lines += ["--movable", f"{vehicle}={entries[vehicle].path}"]
-        for corner in ("FL", "FR", "RL", "RR"):
-            lines += ["--movable", f"{vehicle}.{corner}={entries['Wheel'].path}"]
+    for channel in CHANNELS:
+        lines += ["--movable", f"{channel}={entries.get(channel, entries['Wheel']).path}"]
     lines += ["--data", "run.mdf"]
     (folder / "example.args").write_text("\n".join(lines) + "\n", encoding="utf-8")
 

@@ -21,6 +21,7 @@ RATE = 100.0
 DURATION = 68.0
 _GRAVITY = 9.81
 CORNERS = ("FL", "FR", "RL", "RR")
+CHANNELS = [vehicle + corner for vehicle in ("Sedan", "Van") for corner in ("", *("." + c for c in CORNERS))]
 
 
 @dataclass(frozen=True)
@@ -196,9 +197,8 @@ def _gears(motion: Motion) -> tuple[Array, Array]:
 def write_run(course: Course, path: Path) -> None:
     sedan, van = drive(course, SEDAN), drive(course, VAN)
     gears, engine = _gears(sedan)
-    names = [name + corner for name in ("Sedan", "Van") for corner in ("", *("." + c for c in CORNERS))]
     description = {
-        "poses": names,
+        "poses": CHANNELS,
         "instruments": [{"name": "Speed", "unit": "km/h"}, {"name": "EngineSpeed", "unit": "1/min"},
                         {"name": "SteeringAngle", "unit": "deg"}, {"name": "LateralAcceleration", "unit": "m/s^2"},
                         {"name": "Gear", "unit": "-"}, {"name": "Brake", "unit": "%"}],

@@ -1,4 +1,6 @@
-"""Where to take pictures of the run from: "example.shots", a line for each picture."""
+"""When to take pictures of the run: "example.shots" with a place to look from for each, "panes.shots" of the scene file's
+four panes.
+"""
 
 from __future__ import annotations
 
@@ -33,6 +35,14 @@ SHOTS = [
     Shot(58.2, "7-chicane", (16.0, -6.5, 1.6), (4.0, -1.0, 0.6)),
     Shot(64.0, "8-course", (-70.0, -150.0, 95.0), (90.0, 110.0, -20.0)),
 ]
+
+PANES = [(4.5, "1-start"), (20.6, "2-first-bend"), (28.0, "3-hump"), (42.5, "4-behind-the-van"), (44.6, "5-braking"),
+         (46.0, "6-passing"), (47.9, "7-past-the-roadside"), (58.2, "8-chicane")]
+
+
+def write_pane_shots(path: Path) -> None:
+    lines = ["# time  name of the picture", *(f"{time:g} {name}" for time, name in PANES)]
+    path.write_text("\n".join(lines) + "\n", encoding="utf-8")
 
 
 def write_shots(course: Course, path: Path) -> None:

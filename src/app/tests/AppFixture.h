@@ -2,10 +2,10 @@
 
 #include <gtest/gtest.h>
 
-#include "app/PanoramicApp.h"
 #include "app/PanoramicDocument.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/tests/SimulationFixture.h"
+#include "tests/support/AppStages.h"
 #include "tests/support/FakeHost.h"
 
 /// The application object in a fake host that has no modules of data points.
@@ -15,12 +15,7 @@ protected:
     /// The stages up to where the frame cycle is live.
     void Start()
     {
-        app.InitInstance();
-        app.Connect();
-        app.ConnectToOtherComponents();
-        app.InsertGUIElements();
-        app.StartupCompleted();
-        app.FinalizeInitialization();
+        fake::StartApplication(app);
         host.messages.shown.clear();
     }
 
@@ -33,11 +28,7 @@ protected:
     void Stop()
     {
         CloseDocuments();
-        std::int32_t answer = 0;
-        app.StartShutdown(answer);
-        app.RemoveGUIElements();
-        app.RemoveComponentConnections();
-        app.Disconnect();
+        fake::StopApplication(app);
     }
 
     VtCPanoramicDocument* NewDocument()

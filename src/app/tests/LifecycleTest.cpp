@@ -39,6 +39,7 @@ TEST_F(Lifecycle, EachStageTakesWhatItsCounterpartGivesBack)
 
     app.StartupCompleted();
     ASSERT_NE(app.GetController(), nullptr);
+    EXPECT_NE(app.GetControllerDialog(), nullptr);
     EXPECT_TRUE(WasShown(host::Severity::error, 303)) << "this host has no modules of data points";
     ASSERT_FALSE(host.messages.shown.empty());
     EXPECT_EQ(host.messages.shown.back().number, 1U);
@@ -58,6 +59,7 @@ TEST_F(Lifecycle, EachStageTakesWhatItsCounterpartGivesBack)
     EXPECT_TRUE(host.messages.shown.empty());
 
     app.StartShutdown(answer);
+    EXPECT_EQ(app.GetControllerDialog(), nullptr);
     EXPECT_EQ(answer, 0);
     EXPECT_EQ(app.GetController(), nullptr);
     app.RemoveGUIElements();

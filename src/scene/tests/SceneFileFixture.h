@@ -3,6 +3,7 @@
 #include <filesystem>
 #include <fstream>
 #include <iterator>
+#include <set>
 #include <string>
 
 #include <unistd.h>
@@ -65,6 +66,15 @@ public:
     {
         std::ifstream file(path / name, std::ios::binary);
         return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
+    }
+
+    /// Of the files in it.
+    std::set<std::string> Names() const
+    {
+        std::set<std::string> names;
+        for (const auto& entry : std::filesystem::directory_iterator(path))
+            names.insert(entry.path().filename().string());
+        return names;
     }
 
     std::filesystem::path path;

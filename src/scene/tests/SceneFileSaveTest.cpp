@@ -2,12 +2,15 @@
 
 #include <csignal>
 #include <cstdint>
+#include <set>
 #include <string>
+#include <vector>
 
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "base/AtomicFile.h"
 #include "scene/SceneFileText.h"
 #include "scene/tests/SceneFileFixture.h"
 #include "scene/tests/SceneFixture.h"
@@ -72,6 +75,56 @@ TEST(SceneFileSave, AKilledSaveLeavesTheOldFileOrTheNewOne)
     }
     EXPECT_GT(found[0], 0);
     EXPECT_GT(found[1], 0);
+}
+
+TEST(SceneFileSave, TheNextSaveRemovesWhatAKilledOneLeftAndNothingElse)
+{
+    const Folder folder;
+    const std::wstring path = folder.Inner("scene.xml");
+    const std::set<std::string> mine = {"scene.xml.backup", "scene.xml.writing-notes.txt", "other.xml.writing-a1B2c3"};
+    for (const std::string& name : mine)
+        folder.Write(name, "mine");
+    const pid_t child = fork();
+    if (child == 0)
+    {
+        base::AtomicFile half(base::NativePath(path));
+        half.Write("<?xml");
+        ::kill(getpid(), SIGKILL);
+    }
+    ASSERT_GT(child, 0);
+    waitpid(child, nullptr, 0);
+    ASSERT_EQ(folder.Names().size(), mine.size() + 1) << "the killed one has left something";
+
+    std::set<std::string> expected = mine;
+    expected.insert("scene.xml");
+    VtCSceneObjectStore store = StoreOf("body", 3);
+    {
+        base::AtomicFile other(base::NativePath(path));
+        ASSERT_TRUE(store.SaveFile(path));
+        EXPECT_EQ(folder.Names().size(), expected.size() + 1) << "a file that is being written stays";
+    }
+    EXPECT_EQ(folder.Names(), expected);
+}
+
+TEST(SceneFileSave, RecordsThatWereGivenOneIdCanBeReadAgain)
+{
+    const Folder folder;
+    VtCSceneObjectStore store = StoreOf("body", 6);
+    const auto edit = [&](const wchar_t* key, const wchar_t* id)
+    { store.GetObject(key)->Write(L"internal_id", std::wstring(id)); };
+    edit(L"1", L"3"); // an object lives under it
+    edit(L"2", L"Mine");
+    edit(L"4", L"MINE"); // the same without regard to case
+    edit(L"5", L"4");    // free until 4 gets it back
+    ASSERT_TRUE(store.SaveFile(folder.Inner("scene.xml")));
+
+    const VtTSceneRecords read = ParseSceneText(folder.Read("scene.xml"));
+    ASSERT_EQ(read.error, "");
+    std::vector<std::wstring> ids;
+    for (const auto& object : read.objects)
+        ids.push_back(*object->Find<std::wstring>(L"internal_id"));
+    ASSERT_EQ(ids.size(), 6U);
+    EXPECT_EQ(ids, (std::vector<std::wstring>{L"0", L"1", L"Mine", L"3", L"4", L"5"}));
 }
 
 class SceneSave : public SceneFixture

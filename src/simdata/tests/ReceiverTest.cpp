@@ -8,9 +8,9 @@
 #include "scene/ObjectText.h"
 #include "scene/Scene3D.h"
 #include "simdata/ChannelLists.h"
-#include "simdata/tests/Allocations.h"
 #include "simdata/tests/SimulationFixture.h"
 #include "tests/support/FakeScene.h"
+#include "tests/support/HeapCount.h"
 
 using namespace simtest;
 using SimulationDataPoints::VtCFrameRecord;
@@ -295,19 +295,19 @@ TEST_F(Receiver, StepsWithoutTheHeap)
     const auto count = [&]
     {
         controller.Step();
-        const std::size_t before = Allocations();
+        heap::Count allocations;
         for (int i = 0; i < 50; ++i)
         {
             clock.Advance(0.003);
             controller.Step();
         }
-        return Allocations() - before;
+        return allocations.Stop();
     };
     controller.PlayLoop();
-    EXPECT_EQ(count(), 0U) << "in a loop";
+    EXPECT_EQ(count(), 0) << "in a loop";
     controller.StopPlay();
     controller.Start();
-    EXPECT_EQ(count(), 0U) << "online";
+    EXPECT_EQ(count(), 0) << "online";
 }
 
 } // namespace
