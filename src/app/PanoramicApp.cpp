@@ -24,6 +24,8 @@
 #include "scene/SceneObjectStore.h"
 #include "simdata/SimulationDataController.h"
 #include "simdata/SimulationServices.h"
+#include "ui/SimulationDataControllerDialog.h"
+#include "ui/SimulationDataCustomizeSheet.h"
 
 namespace
 {
@@ -160,6 +162,21 @@ void VtCPanoramicApp::MakeController()
                                                                                      .questions = questions});
     if (sceneServices)
         sceneServices->channels = &controller->GetRouter();
+    MakeControllerDialog();
+}
+
+void VtCPanoramicApp::MakeControllerDialog()
+{
+    if (!userInterface)
+        return;
+    customizeSheet = std::make_unique<VtCSimulationDataCustomizeSheet>(
+        *controller, VtTCustomizeServices{.texts = host.GetTexts(),
+                                          .messages = host.GetMessageService(),
+                                          .sheets = host.GetPropertySheets(),
+                                          .questions = questions,
+                                          .progress = progress});
+    controllerDialog =
+        std::make_unique<VtCSimulationDataControllerDialog>(*controller, customizeSheet.get(), userInterface);
 }
 
 std::vector<std::wstring> VtCPanoramicApp::PluginFolders() const
@@ -194,6 +211,8 @@ void VtCPanoramicApp::StartShutdown(std::int32_t& refused)
         controller->Stop();
     if (sceneServices)
         sceneServices->channels = nullptr;
+    controllerDialog.reset();
+    customizeSheet.reset();
     controller.reset();
     graphicsSession.reset();
     refused = 0;

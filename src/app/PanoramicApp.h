@@ -27,6 +27,8 @@ class VtCPanoramicDocument;
 class VtCPanoramicView;
 class VtCSceneObjectStore;
 class VtCSimulationDataController;
+class VtCSimulationDataControllerDialog;
+class VtCSimulationDataCustomizeSheet;
 struct VtTMenuState;
 struct VtTSceneServices;
 
@@ -108,6 +110,9 @@ public:
     /// Null before `StartupCompleted` and after `StartShutdown`.
     VtCSimulationDataController* GetController() const { return controller.get(); }
 
+    /// As long as the controller, in a host with a user interface; null otherwise.
+    VtCSimulationDataControllerDialog* GetControllerDialog() const { return controllerDialog.get(); }
+
     /// Folder of the program with a trailing backslash; empty when it can't be told.
     std::wstring GetModuleDirectory() const;
     void SetApplicationVariable(const std::wstring& name, const std::wstring& value);
@@ -147,6 +152,7 @@ private:
     void ConnectAssets();
     void ConnectViewer();
     void MakeController();
+    void MakeControllerDialog();
     std::vector<std::wstring> PluginFolders() const;
 
     host::Host& host;
@@ -167,6 +173,8 @@ private:
     std::unique_ptr<VtCGlidePanelToolBarEventsSink> toolBarSink;
     std::unique_ptr<VtCVisualizationPPGSettings> settings;
     std::unique_ptr<VtCSimulationDataController> controller;
+    std::unique_ptr<VtCSimulationDataCustomizeSheet> customizeSheet;
+    std::unique_ptr<VtCSimulationDataControllerDialog> controllerDialog;
 
     bool multisampling = false;
     std::uint32_t mouseSensitivity = 5;

@@ -11,6 +11,7 @@ class LibraryPaths;
 class MainWindow;
 class MessageService;
 class Progress;
+class PropertySheets;
 class Questions;
 class Settings;
 class Texts;
@@ -42,6 +43,9 @@ public:
     virtual Questions* GetQuestions() = 0;
     virtual Graphics* GetGraphics() = 0;
     virtual ViewWindows* GetViewWindows() = 0;
+
+    /// Null in a host without dialogs.
+    virtual PropertySheets* GetPropertySheets() { return nullptr; }
 };
 
 } // namespace host

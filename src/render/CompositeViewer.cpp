@@ -75,6 +75,13 @@ void VtCOsgCompositeViewer::AddView(osgViewer::View& view)
         GiveStartTick(view);
 }
 
+void VtCOsgCompositeViewer::RemoveView(osgViewer::View& view)
+{
+    if (getViewWithFocus() == &view)
+        setCameraWithFocus(nullptr);
+    std::erase(_views, &view);
+}
+
 void VtCOsgCompositeViewer::SetStats(VtCOsgViewerStats& newStats)
 {
     setViewerStats(&newStats);
@@ -141,7 +148,8 @@ void VtCOsgCompositeViewer::advance(double simulationTime)
     _frameStamp->setReferenceTime(now);
     _frameStamp->setSimulationTime(simulationTime == USE_REFERENCE_TIME ? now : simulationTime);
 
-    if (frameStats->collectStats("frame_rate"))
+    // The first frame has none before it: the time since the viewer's start would count as a rate of thousands.
+    if (frameStats->collectStats("frame_rate") && previousFrame > 0)
     {
         const double duration = now - previousTime;
         frameStats->SetFrameValue(previousFrame, "Frame duration", duration);

@@ -29,6 +29,9 @@ public:
     /// Like `addView`; a view that joins a running viewer also gets its start tick.
     void AddView(osgViewer::View& view);
 
+    /// Takes the view out as it is. The library's `removeView` would close its context, for good.
+    void RemoveView(osgViewer::View& view);
+
     void SetStats(VtCOsgViewerStats& newStats);
 
     void frame(double simulationTime) override;

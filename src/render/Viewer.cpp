@@ -252,7 +252,7 @@ void addViewToViewer(osgViewer::View* view)
 void removeViewFromViewer(osgViewer::View* view)
 {
     if (view && viewerReady)
-        viewer->removeView(view);
+        viewer->RemoveView(*view);
 }
 
 bool isViewInViewer(const osgViewer::View* view)

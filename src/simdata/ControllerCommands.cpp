@@ -3,6 +3,7 @@
 
 #include "host/Messages.h"
 #include "host/Questions.h"
+#include "simdata/CustomizeSheet.h"
 #include "simdata/SimulationDataController.h"
 
 namespace
@@ -92,6 +93,11 @@ std::optional<VtTMenuState> VtCSimulationDataController::GetMenuState(std::uint3
         return VtTMenuState{{true, false}, {}};
     if (command == noDataPoint)
         return VtTMenuState{{!IsOnline(), router.GetActivePoint(0) == nullptr}, {}};
+    if (command == customize)
+    {
+        const bool shown = customizeSheet && customizeSheet->CanCustomize();
+        return VtTMenuState{{shown && IsCommandEnabled(selectedPoint, command).enabled, false}, {}};
+    }
     if (IsSelect(command))
     {
         const std::vector<std::wstring> names = router.GetPointNames(VtCSimulationDataRouter::sources);
@@ -128,6 +134,8 @@ void VtCSimulationDataController::Execute(std::uint32_t command)
         return Start();
     case stop:
         return Stop();
+    case customize:
+        return customizeSheet->Customize();
     case noDataPoint:
         return ChoosePoint({});
     case store:

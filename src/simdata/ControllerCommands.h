@@ -7,8 +7,9 @@
 /// Command numbers of the menus and tool bars that the simulation data controller answers.
 namespace ControllerCommand
 {
-inline constexpr std::uint32_t pointList = 6241;    ///< a control, not a command
-inline constexpr std::uint32_t speedControl = 6681; ///< likewise
+inline constexpr std::uint32_t pointList = 6241;      ///< a control, not a command
+inline constexpr std::uint32_t customizePoint = 6242; ///< likewise, as the next
+inline constexpr std::uint32_t speedControl = 6681;
 inline constexpr std::uint32_t refreshChannels = 38713;
 inline constexpr std::uint32_t start = 38714;
 inline constexpr std::uint32_t stop = 38715;

@@ -250,16 +250,20 @@ bool VtCSimulationDataController::SetBufferSizes(std::int32_t simulationFrames, 
     return true;
 }
 
+void VtCSimulationDataController::SetSelectedPoint(const std::wstring& name)
+{
+    if (base::EqualsNoCase(name, selectedPoint))
+        return;
+    if (auto* old = router.FindPoint(selectedPoint))
+        old->OnDeselect();
+    selectedPoint = name;
+    if (auto* chosen = router.FindPoint(name))
+        chosen->OnSelect();
+}
+
 void VtCSimulationDataController::ChoosePoint(const std::wstring& name)
 {
-    if (!base::EqualsNoCase(name, selectedPoint))
-    {
-        if (auto* old = router.FindPoint(selectedPoint))
-            old->OnDeselect();
-        selectedPoint = name;
-        if (auto* chosen = router.FindPoint(name))
-            chosen->OnSelect();
-    }
+    SetSelectedPoint(name);
     if (name.empty())
         router.DeselectPoint(router.GetActivePointName(0));
     else

@@ -12,6 +12,8 @@
 #include "simdata/SimulationServices.h"
 #include "simdata/SimulationState.h"
 
+class VtICustomizeSheet;
+
 /// The one place where the state of the simulation lives: the mode, online or offline, and the play state.
 ///
 /// Every command to start, stop, play and step goes through it, and the frame cycle calls its `Step` once per idle
@@ -110,7 +112,14 @@ public:
 
     /// The user's choice in a list of points; an empty name is "none". Tells the old and the new point, and selects.
     void ChoosePoint(const std::wstring& name);
+
+    /// The list of points shows another entry than before, but not by the user's choice: the points are told, and
+    /// nothing is selected.
+    void SetSelectedPoint(const std::wstring& name);
     const std::wstring& GetSelectedPoint() const { return selectedPoint; }
+
+    /// Who shows the customise sheet, not owned; null for nobody, and the command is disabled.
+    void SetCustomizeSheet(VtICustomizeSheet* sheet) { customizeSheet = sheet; }
 
     /// Carries out a command if it is enabled. True for every command that is the controller's, enabled or not.
     bool OnCmdMsg(std::uint32_t command);
@@ -139,4 +148,5 @@ private:
     std::int32_t simulationBufferFrames;
     double speed = 1.0;
     std::wstring selectedPoint;
+    VtICustomizeSheet* customizeSheet = nullptr;
 };

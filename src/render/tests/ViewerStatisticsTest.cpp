@@ -119,10 +119,12 @@ TEST_F(ViewerStatistics, TellsTheFrameRateOfTheLastFrames)
 {
     EXPECT_EQ(0.0, getFrameRate());
     AddView(scenes::Boxes(), 64, 64);
+    RenderViewerFrame();
+    EXPECT_EQ(0.0, getFrameRate()) << "one frame has no rate";
     for (int frame = 0; frame < 5; ++frame)
         RenderViewerFrame();
     double sum = 0.0;
-    for (unsigned int frame = 0; frame < 5; ++frame)
+    for (unsigned int frame = 1; frame < 6; ++frame)
     {
         double duration = 0.0;
         ASSERT_TRUE(viewerStats->getAttribute(frame, "Frame duration", duration)) << frame;

@@ -206,6 +206,7 @@ TEST_F(Views, KeepTheirRatiosWhenTheFrameGrowsAndShrinks)
     splitter.OnSize();
     EXPECT_EQ(PanesInViewer(), (std::vector<int>{1, 2, 3, 4}));
     EXPECT_EQ(Pane(1).getView()->getCamera()->getGraphicsContext(), context) << "the context is the old one";
+    EXPECT_TRUE(context->valid()) << "and can be drawn to";
 }
 
 TEST_F(Views, BarsMoveOnlyWhereTheLayoutHasThem)

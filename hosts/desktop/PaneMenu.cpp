@@ -1,0 +1,53 @@
+#include "hosts/desktop/PaneMenu.h"
+
+#include <QActionGroup>
+#include <QMenu>
+
+#include "app/PanoramicDocument.h"
+#include "hosts/desktop/CommandActions.h"
+#include "hosts/desktop/Wording.h"
+#include "interaction/Observer.h"
+#include "interaction/Observers.h"
+#include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
+#include "render/ViewCommandsHandler.h"
+
+namespace desktop
+{
+
+QMenu* MakePaneMenu(QWidget& parent, VtCPanoramicDocument& document, VtCPanoramicView& view, CommandActions& actions,
+                    const host::Texts& texts)
+{
+    auto* menu = new QMenu(&parent);
+    menu->setAttribute(Qt::WA_DeleteOnClose);
+    menu->addSection(ToQt(view.getName()) + " - " + Part(texts, textObserver, 0));
+    auto* group = new QActionGroup(menu);
+    for (const VtC3DObserver* observer : document.GetObservers().GetObservers())
+    {
+        QAction* choice = menu->addAction(ToQt(observer->GetName()).replace('&', "&&"));
+        choice->setCheckable(true);
+        choice->setChecked(view.getObserver() == observer);
+        choice->setStatusTip(Part(texts, textObserver, 1));
+        group->addAction(choice);
+        // By its name and the pane's number: the scene may have changed by the time the choice is made.
+        QObject::connect(choice, &QAction::triggered, menu,
+                         [&document, name = observer->GetName(), pane = view.getViewPosition()]
+                         {
+                             VtCChildFrame* frame = document.GetChildFrame();
+                             VtCPanoramicView* chosen = frame ? frame->getSplitter().getView(pane) : nullptr;
+                             if (chosen && chosen->assignObserverByName(name))
+                                 document.SetModified(true);
+                         });
+    }
+    menu->addSeparator();
+    menu->addAction(actions.Get(commandStraighten));
+    menu->addSeparator();
+    for (const std::uint32_t command : {commandSingleView, commandTwoColumns, commandTwoRows, commandFourViews})
+        menu->addAction(actions.Get(command));
+    QMenu* modes = menu->addMenu(Part(texts, textRenderMode, 0));
+    for (const std::uint32_t command : {commandGouraud, commandTextured, commandFlat, commandWireFrame, commandMixed})
+        modes->addAction(actions.Get(command));
+    return menu;
+}
+
+} // namespace desktop

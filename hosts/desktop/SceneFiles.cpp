@@ -1,0 +1,260 @@
+#include "hosts/desktop/SceneFiles.h"
+
+#include <QMessageBox>
+
+#include "app/PanoramicApp.h"
+#include "app/PanoramicDocument.h"
+#include "base/Paths.h"
+#include "base/Text.h"
+#include "hosts/common/IniTexts.h"
+#include "hosts/desktop/DesktopHost.h"
+#include "hosts/desktop/StateFile.h"
+#include "hosts/desktop/Wording.h"
+#include "scene/SceneObjectStore.h"
+#include "simdata/SimulationDataController.h"
+
+namespace desktop
+{
+
+namespace
+{
+
+constexpr std::uint32_t messageSceneNotReadable = 496; // %1 the file, %2 the reason
+constexpr std::uint32_t messageDataUnusable = 9111;    // %1 the file
+constexpr std::uint32_t messageNoFilePoint = 9110;
+constexpr std::uint32_t textOtherSceneType = 9014;
+constexpr std::uint32_t textLoadingData = 7004;
+
+constexpr std::uint32_t textLoadingScene = 7002;
+
+// Numbers of the progress activities.
+constexpr long loadingData = 41;
+constexpr long loadingScene = 40;
+constexpr long loadingRecords = 51;
+constexpr long loadingBody = 50;
+
+const std::wstring filePoint = L"File";
+const std::wstring sceneFilter = L"Scene Config Files (*.xml)|*.xml||";
+
+bool HasExtension(const std::wstring& path, const wchar_t* extension)
+{
+    return base::EqualsNoCase(base::Wide(base::NativePath(path).extension().string()), extension);
+}
+
+/// No idle events, as one would find half a scene.
+class Pause
+{
+public:
+    explicit Pause(IdlePump& idlePump) : pump(idlePump) { pump.Suspend(); }
+    ~Pause() { pump.Resume(); }
+    Pause(const Pause&) = delete;
+    Pause& operator=(const Pause&) = delete;
+
+private:
+    IdlePump& pump;
+};
+
+} // namespace
+
+SceneFiles::SceneFiles(VtCPanoramicApp& application, DesktopHost& desktopHost, StateFile& stateFile,
+                       QWidget& parentWindow, std::function<void()> changedFiles)
+    : app(application), host(desktopHost), state(stateFile), window(parentWindow), changed(std::move(changedFiles))
+{
+}
+
+bool SceneFiles::IsModified() const
+{
+    const VtCPanoramicDocument* document = app.GetActiveDocument();
+    return document && document->IsModified();
+}
+
+std::wstring SceneFiles::GetSceneName() const
+{
+    return scenePath.empty() ? host.GetTexts().GetText(textUntitled)
+                             : base::Wide(base::NativePath(scenePath).filename().string());
+}
+
+void SceneFiles::New()
+{
+    if (!MayClose())
+        return;
+    const Pause pause(host.GetPump());
+    CloseScene();
+    host.GetDocumentManager()->NewDocument();
+    changed();
+}
+
+void SceneFiles::Open()
+{
+    if (const auto path = host.GetQuestions()->AskOpenFile(
+            {FromQt(Part(host.GetTexts(), textOpenScene, 1)), sceneFilter, L"xml", scenePath}))
+        OpenScene(*path);
+}
+
+void SceneFiles::OpenData()
+{
+    if (const auto path = host.GetQuestions()->AskOpenFile({FromQt(Part(host.GetTexts(), textOpenData, 1)),
+                                                            host.GetTexts().GetText(textDataFilter), L"mdf", dataPath}))
+        LoadData(*path);
+}
+
+bool SceneFiles::OpenFile(const std::wstring& path)
+{
+    if (HasExtension(path, L".xml"))
+        return OpenScene(path);
+    if (HasExtension(path, L".mdf"))
+        return LoadData(path);
+    app.GetMessageHandler().ShowWarning(messageOtherFile, FromQt(ShownPath(path)));
+    return false;
+}
+
+bool SceneFiles::CanRead(const std::wstring& path)
+{
+    std::wstring reason;
+    if (!HasExtension(path, L".xml"))
+        reason = host.GetTexts().GetText(textOtherSceneType);
+    else
+    {
+        VtCSceneObjectStore trial;
+        if (trial.LoadFile(path))
+            return true;
+        reason = trial.GetFileError();
+    }
+    app.GetMessageHandler().ShowError(messageSceneNotReadable, FromQt(ShownPath(path)), reason);
+    return false;
+}
+
+bool SceneFiles::OpenScene(const std::wstring& path)
+{
+    if (!CanRead(path) || !MayClose())
+        return false;
+    const Pause pause(host.GetPump());
+    // A scene takes its data with it when it closes; the source that the user chose serves the next one too.
+    VtCSimulationDataController* controller = app.GetController();
+    const std::wstring source = controller ? controller->GetRouter().GetActivePointName(0) : std::wstring();
+    CloseScene();
+    if (controller && !source.empty())
+        controller->ChoosePoint(source);
+    host::Progress& progress = *host.GetProgress();
+    const std::wstring title = host.GetTexts().GetText(textLoadingScene);
+    for (const long activity : {loadingScene, loadingRecords, loadingBody})
+        progress.ConnectProgressActivity(activity, title, {});
+    const bool opened = host.GetDocumentManager()->OpenDocument(path) != nullptr;
+    for (const long activity : {loadingBody, loadingRecords, loadingScene})
+        progress.DisconnectProgressActivity(activity);
+    if (opened)
+    {
+        scenePath = path;
+        Remember(path);
+    }
+    else
+        host.GetDocumentManager()->NewDocument();
+    if (controller && !source.empty())
+        controller->GotoFirst();
+    changed();
+    return opened;
+}
+
+void SceneFiles::CloseScene()
+{
+    if (VtCSimulationDataController* controller = app.GetController())
+    {
+        controller->StopPlay();
+        controller->Stop();
+        controller->Reset();
+    }
+    while (host.GetDocumentManager()->GetActiveDocument())
+        host.GetDocumentManager()->CloseActiveDocument();
+    scenePath.clear();
+}
+
+bool SceneFiles::LoadData(const std::wstring& path)
+{
+    VtCSimulationDataController* controller = app.GetController();
+    SimulationDataPoints::VtCSimulationDataPoint* point =
+        controller ? controller->GetRouter().FindPoint(filePoint) : nullptr;
+    if (!point)
+    {
+        app.GetMessageHandler().ShowError(messageNoFilePoint);
+        return false;
+    }
+    controller->StopPlay();
+    controller->Stop();
+
+    const Pause pause(host.GetPump());
+    host::Progress& progress = *host.GetProgress();
+    progress.ConnectProgressActivity(loadingData, host.GetTexts().GetText(textLoadingData),
+                                     base::Wide(base::NativePath(path).filename().string()));
+    point->SetProgressBarActivityID(loadingData);
+    const bool configured = point->Configure(L"MDF", path, 1, 0) != 0;
+    progress.DisconnectProgressActivity(loadingData);
+
+    const bool explained = point->GetMessageStack() != nullptr;
+    if (explained)
+    {
+        app.GetMessageHandler().ReportStack(*point->GetMessageStack());
+        point->ResetMessageStack();
+    }
+    if (!configured)
+    {
+        if (!explained)
+            app.GetMessageHandler().ShowError(messageDataUnusable, FromQt(ShownPath(path)));
+        return false;
+    }
+    controller->ChoosePoint(filePoint);
+    controller->GetRouter().NotifyConfiguration(controller->GetRouter().GetConfigurationText(filePoint, 0));
+    controller->GotoFirst();
+    dataPath = path;
+    Remember(path);
+    changed();
+    return true;
+}
+
+bool SceneFiles::Save()
+{
+    return scenePath.empty() ? SaveAs() : SaveTo(scenePath);
+}
+
+bool SceneFiles::SaveAs()
+{
+    const auto path = host.GetQuestions()->AskSaveFile(
+        {FromQt(Part(host.GetTexts(), textSaveAs, 1)), sceneFilter, L"xml", scenePath});
+    return path && SaveTo(*path);
+}
+
+bool SceneFiles::SaveTo(const std::wstring& path)
+{
+    VtCPanoramicDocument* document = app.GetActiveDocument();
+    if (!document || !document->OnSaveDocument(path))
+        return false;
+    scenePath = path;
+    Remember(path);
+    changed();
+    return true;
+}
+
+bool SceneFiles::MayClose()
+{
+    if (!IsModified())
+        return true;
+    QMessageBox question(QMessageBox::Question, ToQt(app.GetName()),
+                         ToQt(hosts::IniTexts::Format(host.GetTexts(), textSaveChanges, GetSceneName(), {})),
+                         QMessageBox::Save | QMessageBox::Discard | QMessageBox::Cancel, &window);
+    question.setDefaultButton(QMessageBox::Save);
+    switch (question.exec())
+    {
+    case QMessageBox::Save:
+        return Save();
+    case QMessageBox::Discard:
+        return true;
+    default:
+        return false;
+    }
+}
+
+void SceneFiles::Remember(const std::wstring& path)
+{
+    state.AddRecentFile(base::NativePath(path).string());
+}
+
+} // namespace desktop

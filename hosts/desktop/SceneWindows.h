@@ -1,0 +1,41 @@
+#pragma once
+
+#include <functional>
+#include <string>
+
+#include <QPointer>
+
+#include "host/ViewWindows.h"
+
+class QWidget;
+
+namespace desktop
+{
+
+class ViewArea;
+class ViewSurroundings;
+
+/// Makes the window of a scene in the middle of the main window, and tells on what is selected.
+class SceneWindows : public host::ViewWindows
+{
+public:
+    /// `place` shows the window of a scene it is given, null when it goes. `select` gets the id of the selected object.
+    SceneWindows(ViewSurroundings& programAround, std::function<void(ViewArea*)> place,
+                 std::function<void(const std::wstring&)> select);
+
+    /// The grid of the scene that is open; null while there is none.
+    ViewArea* GetArea() const;
+
+    std::unique_ptr<host::ChildFrameWindow> MakeChildFrame() override;
+    void SelectObject(const std::wstring& internalId) override { select(internalId); }
+
+private:
+    class Frame;
+
+    ViewSurroundings& surroundings;
+    std::function<void(ViewArea*)> place;
+    std::function<void(const std::wstring&)> select;
+    QPointer<ViewArea> area;
+};
+
+} // namespace desktop
