@@ -255,6 +255,13 @@ void VtCOsgCameramanipulator::setByMatrix(const osg::Matrixd& matrix)
     rotation = matrix.getRotate();
 }
 
+void VtCOsgCameramanipulator::setByInverseMatrix(const osg::Matrixd& matrix)
+{
+    // In every frame, so without the inverse of a matrix of any kind.
+    rotation = matrix.getRotate().conj();
+    position = rotation * -matrix.getTrans();
+}
+
 osg::Matrixd VtCOsgCameramanipulator::getMatrix() const
 {
     const osg::Matrixd placement = osg::Matrixd::rotate(rotation) * osg::Matrixd::translate(position);

@@ -38,7 +38,9 @@ public:
 
     bool handle(const osgGA::GUIEventAdapter& event, osgGA::GUIActionAdapter& actions) override;
     void setByMatrix(const osg::Matrixd& matrix) override;
-    void setByInverseMatrix(const osg::Matrixd& matrix) override { setByMatrix(osg::Matrixd::inverse(matrix)); }
+
+    /// Takes a view matrix, which only turns and moves.
+    void setByInverseMatrix(const osg::Matrixd& matrix) override;
     osg::Matrixd getMatrix() const override;
     osg::Matrixd getInverseMatrix() const override;
 

@@ -188,21 +188,22 @@ void VtC3DObserver::Place(const Placement& placement)
 {
     // The head turn of looking at a body takes the place of the offset about z.
     const osg::Vec3f angles(offsetAngles.x(), offsetAngles.y(), followMode == followLookAt ? 0.0f : offsetAngles.z());
-    osg::Matrixd camera = CameraAxes(angles) * osg::Matrixd::rotate(placement.rotation);
-    camera.setTrans(placement.position);
+    const osg::Quat camera = CameraAxes(angles) * placement.rotation;
     position = placement.position;
-    setMatrix(osg::Matrixd::inverse(camera), true);
+    osg::Matrixd view = osg::Matrixd::rotate(camera.conj());
+    view.preMultTranslate(-osg::Vec3d(position));
+    setMatrix(view, true);
 }
 
 // Two quarter turns and a half one change from the axes of a body to those of a camera. They stay the same for many
 // frames, and their sines cost more than the rest of the placement.
-const osg::Matrixd& VtC3DObserver::CameraAxes(const osg::Vec3f& angles)
+const osg::Quat& VtC3DObserver::CameraAxes(const osg::Vec3f& angles)
 {
     if (!cameraAxes || axesAngles != angles)
     {
-        cameraAxes = osg::Matrixd::rotate(base::RadiansFromDegrees(angles.x() + 90.0), zAxis,
-                                          base::RadiansFromDegrees(angles.y() + 90.0), yAxis,
-                                          base::RadiansFromDegrees(angles.z() + 180.0), zAxis);
+        cameraAxes = osg::Quat(base::RadiansFromDegrees(angles.x() + 90.0), zAxis,
+                               base::RadiansFromDegrees(angles.y() + 90.0), yAxis,
+                               base::RadiansFromDegrees(angles.z() + 180.0), zAxis);
         axesAngles = angles;
     }
     return *cameraAxes;

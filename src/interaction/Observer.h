@@ -133,7 +133,7 @@ private:
     Placement FollowHeading(const osg::Matrixd& body) const;
     Placement LookAt(const osg::Matrixd& body) const;
     void Place(const Placement& placement);
-    const osg::Matrixd& CameraAxes(const osg::Vec3f& angles);
+    const osg::Quat& CameraAxes(const osg::Vec3f& angles);
     void RebuildFreeView(bool update);
     void OnAttachedTo(const std::wstring& name);
     void ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key, float& number);
@@ -143,7 +143,7 @@ private:
     bool isFree = false;
     osg::Vec3f offsetAngles; ///< degrees about x, y, z
     osg::Vec3f offsetTranslation{0, 0, 1.5f};
-    std::optional<osg::Matrixd> cameraAxes; ///< those of the camera, for `axesAngles`
+    std::optional<osg::Quat> cameraAxes; ///< those of the camera, for `axesAngles`
     osg::Vec3f axesAngles;
     osg::Quat offsetRotation;
     osg::Quat orientation;
