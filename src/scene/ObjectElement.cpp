@@ -58,8 +58,23 @@ VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const VtTAttribut
     return type;
 }
 
+// The text of an element that holds one piece of text, as nearly all do; null for others.
+const char* PlainText(const pugi::xml_node& element)
+{
+    const pugi::xml_node only = element.first_child();
+    if (!only)
+        return "";
+    return only.type() == pugi::node_pcdata && !only.next_sibling() ? only.value() : nullptr;
+}
+
 VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
 {
+    const pugi::xml_node first = node.first_child();
+    if (type != VtEAttributeType::textList && IsElement(first) && !first.next_sibling() &&
+        std::string_view(first.name()) == "vtattr:value")
+        if (const char* text = PlainText(first); text && std::string_view(text).size() <= largestValue)
+            return AttributeValueFromText(type, text);
+
     std::vector<std::string> values;
     for (const pugi::xml_node& child : node.children())
         if (IsElement(child) && std::string_view(child.name()) == "vtattr:value")

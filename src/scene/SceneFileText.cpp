@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <cstring>
 #include <unordered_map>
 
 #include <pugixml.hpp>
@@ -44,6 +45,22 @@ std::size_t SequenceLength(std::string_view text, std::size_t at)
     return 0;
 }
 
+// The first place at or behind `at` that doesn't hold a byte from 1 to 127; eight bytes at a time.
+std::size_t EndOfAscii(std::string_view text, std::size_t at)
+{
+    constexpr std::uint64_t ones = 0x0101010101010101;
+    constexpr std::uint64_t highBits = 0x8080808080808080;
+    for (std::uint64_t bytes; at + sizeof bytes <= text.size(); at += sizeof bytes)
+    {
+        std::memcpy(&bytes, text.data() + at, sizeof bytes);
+        if ((bytes | (bytes - ones)) & highBits) // set by bytes from 128 up, and borrowed by bytes of 0
+            break;
+    }
+    while (at < text.size() && static_cast<signed char>(text[at]) > 0)
+        ++at;
+    return at;
+}
+
 void CheckEncoding(std::string_view text)
 {
     if (text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF") ||
@@ -52,11 +69,9 @@ void CheckEncoding(std::string_view text)
     for (std::size_t at = 0; at < text.size();)
     {
         // Nearly all of a file; byte by byte through the rules it would cost as much as the parsing.
-        if (static_cast<signed char>(text[at]) > 0)
-        {
-            ++at;
-            continue;
-        }
+        at = EndOfAscii(text, at);
+        if (at == text.size())
+            return;
         const std::size_t length = SequenceLength(text, at);
         if (length == 0)
             Refuse(at, text[at] == '\0' ? "there is a byte 0" : "the text is not UTF-8");
@@ -94,11 +109,21 @@ private:
         const std::size_t nameAt = at + (closes ? 2 : 1);
         const auto endsName = [](char c)
         { return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '/' || c == '>'; };
-        const auto nameEnd = static_cast<std::size_t>(
-            std::find_if(text.begin() + static_cast<std::ptrdiff_t>(nameAt), text.end(), endsName) - text.begin());
-        const std::string_view name = text.substr(nameAt, nameEnd - nameAt);
-        if (std::find(std::begin(elementNames), std::end(elementNames), name) == std::end(elementNames))
-            Refuse(at, "element <" + Shortened(std::string(name.substr(0, 100)).c_str()) + "> is not expected here");
+        const auto known = std::find_if(std::begin(elementNames), std::end(elementNames),
+                                        [&](std::string_view element)
+                                        {
+                                            const std::size_t end = nameAt + element.size();
+                                            return text.substr(nameAt, element.size()) == element &&
+                                                   (end >= text.size() || endsName(text[end]));
+                                        });
+        if (known == std::end(elementNames))
+        {
+            const auto begin = text.begin() + static_cast<std::ptrdiff_t>(std::min(nameAt, text.size()));
+            const std::string other(begin, std::find_if(begin, text.end(), endsName));
+            Refuse(at, "element <" + Shortened(other.substr(0, 100).c_str()) + "> is not expected here");
+        }
+        const std::string_view name = *known;
+        const std::size_t nameEnd = nameAt + name.size();
         if (closes)
             --depth;
         else if (++depth > deepestElement)
@@ -110,23 +135,22 @@ private:
     std::size_t EndOfTag(std::size_t tag, std::size_t at)
     {
         int quotes = 0;
-        for (; at < text.size(); ++at)
+        for (std::size_t end; (end = text.find('>', at)) != std::string_view::npos;)
         {
-            const char c = text[at];
-            if (c == '"' || c == '\'')
+            const std::string_view part = text.substr(at, end - at);
+            const std::size_t quote = std::min(part.find('"'), part.find('\''));
+            if (quote == std::string_view::npos)
             {
-                if ((quotes += 2) > mostQuotes)
-                    Refuse(tag, "a tag has too many XML attributes");
-                at = text.find(c, at + 1);
-                if (at == std::string_view::npos)
-                    break;
-            }
-            else if (c == '>')
-            {
-                if (text[at - 1] == '/')
+                if (text[end - 1] == '/')
                     --depth;
-                return at + 1;
+                return end + 1;
             }
+            if ((quotes += 2) > mostQuotes)
+                Refuse(tag, "a tag has too many XML attributes");
+            at = text.find(part[quote], at + quote + 1);
+            if (at == std::string_view::npos)
+                break;
+            ++at;
         }
         Refuse(tag, "the text ends within a tag");
     }
