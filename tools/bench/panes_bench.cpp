@@ -23,7 +23,7 @@ namespace
 
 constexpr double frameTime = 0.02;
 constexpr long frameShown = 500; // ten seconds into the run
-constexpr int warmUp = 300;      // display lists, statistics and capacities have settled by then
+constexpr int warmUp = 60;       // display lists and textures are with the driver by then
 
 /// Two that stand and two that ride on the sedan.
 const std::array<const wchar_t*, 4> observers = {L"Free1", L"Grandstand", L"Chase", L"Above"};
