@@ -201,9 +201,9 @@ const osg::Quat& VtC3DObserver::CameraAxes(const osg::Vec3f& angles)
 {
     if (!cameraAxes || axesAngles != angles)
     {
-        cameraAxes = osg::Quat(base::RadiansFromDegrees(angles.x() + 90.0), zAxis,
-                               base::RadiansFromDegrees(angles.y() + 90.0), yAxis,
-                               base::RadiansFromDegrees(angles.z() + 180.0), zAxis);
+        cameraAxes =
+            osg::Quat(base::RadiansFromDegrees(angles.x() + 90.0), zAxis, base::RadiansFromDegrees(angles.y() + 90.0),
+                      yAxis, base::RadiansFromDegrees(angles.z() + 180.0), zAxis);
         axesAngles = angles;
     }
     return *cameraAxes;
