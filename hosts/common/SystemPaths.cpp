@@ -62,6 +62,12 @@ std::filesystem::path FindDataFolder(const std::filesystem::path& module)
     return {};
 }
 
+std::filesystem::path DataFolder(const std::filesystem::path& module)
+{
+    const std::filesystem::path found = FindDataFolder(module);
+    return found.empty() ? module.parent_path() / "share" / "panoramic" : found;
+}
+
 std::filesystem::path ConfigurationFolder()
 {
     // A relative $XDG_CONFIG_HOME is invalid by its own standard and to be ignored.
@@ -70,6 +76,12 @@ std::filesystem::path ConfigurationFolder()
     if (const std::filesystem::path home = Environment("HOME"); home.is_absolute())
         return home / ".config" / "panoramic";
     return {};
+}
+
+std::filesystem::path ConfigurationFile(const char* name)
+{
+    const std::filesystem::path folder = ConfigurationFolder();
+    return folder.empty() ? folder : folder / name;
 }
 
 SystemPaths::SystemPaths(const IniFile& configuration, const std::filesystem::path& data,

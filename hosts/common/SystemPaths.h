@@ -17,9 +17,15 @@ std::filesystem::path ModuleFolder();
 /// in a build tree or where it is installed. Empty when there is none.
 std::filesystem::path FindDataFolder(const std::filesystem::path& module);
 
+/// The same, or where it would lie beside the program, so that a message can name it.
+std::filesystem::path DataFolder(const std::filesystem::path& module);
+
 /// The user's own folder of settings, $XDG_CONFIG_HOME/panoramic or ~/.config/panoramic. It need not exist. Empty
 /// when the user has no home.
 std::filesystem::path ConfigurationFolder();
+
+/// A file in it; empty when there is no home, and nothing is kept then.
+std::filesystem::path ConfigurationFile(const char* name);
 
 /// Where the object libraries and the program lie.
 ///

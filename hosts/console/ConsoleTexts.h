@@ -6,9 +6,7 @@
 namespace console
 {
 
-inline constexpr std::uint32_t messageSceneNotReadable = 496; ///< the component's own; %1 the file, %2 the reason
-inline constexpr std::uint32_t messageNoFilePoint = 9110;
-inline constexpr std::uint32_t messageDataUnusable = 9111;      ///< %1 the file
+inline constexpr std::uint32_t messageSceneNotReadable = 496;   ///< the component's own; %1 the file, %2 the reason
 inline constexpr std::uint32_t messageNoChannel = 9112;         ///< %1 the body, %2 the channel
 inline constexpr std::uint32_t messageChannelsAre = 9113;       ///< %1 their names
 inline constexpr std::uint32_t messageTimeOutside = 9114;       ///< %1 the time, %2 the span

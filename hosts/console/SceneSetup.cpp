@@ -9,6 +9,7 @@
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "host/LibraryPaths.h"
+#include "hosts/common/MotionDataFile.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/Session.h"
 #include "render/AssetManager.h"
@@ -24,13 +25,9 @@ namespace
 {
 
 constexpr std::uint32_t textLoadingScene = 7002;
-constexpr std::uint32_t textLoadingData = 7004;
 
 // Numbers of the progress activities.
 constexpr long loadingScene = 51;
-constexpr long loadingData = 41;
-
-const std::wstring filePoint = L"File";
 
 std::filesystem::path Complete(const std::filesystem::path& file)
 {
@@ -145,28 +142,24 @@ bool LoadData(Session& session, const std::filesystem::path& file)
 {
     ConsoleHost& host = session.GetHost();
     VtCSimulationDataRouter& router = session.GetController().GetRouter();
-    SimulationDataPoints::VtCSimulationDataPoint* point = router.FindPoint(filePoint);
+    SimulationDataPoints::VtCSimulationDataPoint* point = router.FindPoint(hosts::filePoint);
     if (!point)
     {
-        host.ShowError(messageNoFilePoint);
+        host.ShowError(hosts::messageNoFilePoint);
         return false;
     }
-    host::Progress& progress = *host.GetProgress();
-    progress.ConnectProgressActivity(loadingData, host.GetTexts().GetText(textLoadingData),
-                                     base::Wide(file.filename().string()));
-    point->SetProgressBarActivityID(loadingData);
-    const bool configured = point->Configure(L"MDF", base::InnerPath(Complete(file)), 1, 0) != 0;
-    progress.DisconnectProgressActivity(loadingData);
+    const bool configured =
+        hosts::LoadMotionData(*point, base::InnerPath(Complete(file)), *host.GetProgress(), host.GetTexts());
 
     if (configured)
-        session.GetController().ChoosePoint(filePoint);
+        session.GetController().ChoosePoint(hosts::filePoint);
     if (SimulationDataPoints::VtCMessageStack* stack = point->GetMessageStack())
     {
         session.GetApp().GetMessageHandler().ReportStack(*stack);
         point->ResetMessageStack();
     }
     if (!configured && session.GetExitStatus() == 0)
-        host.ShowError(messageDataUnusable, file.string());
+        host.ShowError(hosts::messageDataUnusable, file.string());
     return configured;
 }
 

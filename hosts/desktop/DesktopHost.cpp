@@ -1,29 +1,9 @@
 #include "hosts/desktop/DesktopHost.h"
 
-#include "base/Text.h"
 #include "hosts/common/HostMessages.h"
 
 namespace desktop
 {
-
-namespace
-{
-
-// Where the data folder isn't to be found, its place beside the program is what a message can name.
-std::filesystem::path DataFolder(const std::filesystem::path& module)
-{
-    const std::filesystem::path found = hosts::FindDataFolder(module);
-    return found.empty() ? module.parent_path() / "share" / "panoramic" : found;
-}
-
-// Without a home there is no file, and nothing is kept.
-std::filesystem::path ConfigurationFile(const char* name)
-{
-    const std::filesystem::path folder = hosts::ConfigurationFolder();
-    return folder.empty() ? folder : folder / name;
-}
-
-} // namespace
 
 void DesktopVariables::SetWindow(WindowServices* newWindow)
 {
@@ -51,12 +31,12 @@ std::wstring DesktopVariables::GetText(const std::wstring& name) const
 
 DesktopHost::DesktopHost()
     : module(hosts::ModuleFolder()),
-      data(DataFolder(module)),
+      data(hosts::DataFolder(module)),
       texts(data / "texts" / "en.ini"),
       messages(texts),
-      configurationFile(ConfigurationFile("configuration.ini")),
+      configurationFile(hosts::ConfigurationFile("configuration.ini")),
       configuration(configurationFile, messages),
-      settings(ConfigurationFile("settings.ini"), messages),
+      settings(hosts::ConfigurationFile("settings.ini"), messages),
       paths(configurationFile, data, module),
       loop(clock, messages),
       pump(loop, clock, messages),
@@ -65,13 +45,7 @@ DesktopHost::DesktopHost()
       questions(texts)
 {
     messages.SetBusy([this] { return pump.IsSuspended(); });
-    const auto warn = [this](std::uint32_t number, const std::string& reason)
-    {
-        if (!reason.empty())
-            messages.Show({.number = number, .first = base::Wide(reason), .severity = host::Severity::warning});
-    };
-    warn(hosts::messageTextsMissing, texts.Error());
-    warn(hosts::messageDefaultsUsed, configurationFile.Error());
+    hosts::WarnOfFiles(messages, texts, configurationFile);
 }
 
 DesktopHost::~DesktopHost() = default;
@@ -85,7 +59,7 @@ void DesktopHost::SetWindow(WindowServices* services, host::ViewWindows* windows
 
 std::filesystem::path DesktopHost::GetStateFile() const
 {
-    return ConfigurationFile("desktop.ini");
+    return hosts::ConfigurationFile("desktop.ini");
 }
 
 } // namespace desktop

@@ -7,6 +7,7 @@
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/common/IniTexts.h"
+#include "hosts/common/MotionDataFile.h"
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/Wording.h"
@@ -20,20 +21,15 @@ namespace
 {
 
 constexpr std::uint32_t messageSceneNotReadable = 496; // %1 the file, %2 the reason
-constexpr std::uint32_t messageDataUnusable = 9111;    // %1 the file
-constexpr std::uint32_t messageNoFilePoint = 9110;
 constexpr std::uint32_t textOtherSceneType = 9014;
-constexpr std::uint32_t textLoadingData = 7004;
 
 constexpr std::uint32_t textLoadingScene = 7002;
 
 // Numbers of the progress activities.
-constexpr long loadingData = 41;
 constexpr long loadingScene = 40;
 constexpr long loadingRecords = 51;
 constexpr long loadingBody = 50;
 
-const std::wstring filePoint = L"File";
 const std::wstring sceneFilter = L"Scene Config Files (*.xml)|*.xml||";
 
 bool HasExtension(const std::wstring& path, const wchar_t* extension)
@@ -172,22 +168,17 @@ bool SceneFiles::LoadData(const std::wstring& path)
 {
     VtCSimulationDataController* controller = app.GetController();
     SimulationDataPoints::VtCSimulationDataPoint* point =
-        controller ? controller->GetRouter().FindPoint(filePoint) : nullptr;
+        controller ? controller->GetRouter().FindPoint(hosts::filePoint) : nullptr;
     if (!point)
     {
-        app.GetMessageHandler().ShowError(messageNoFilePoint);
+        app.GetMessageHandler().ShowError(hosts::messageNoFilePoint);
         return false;
     }
     controller->StopPlay();
     controller->Stop();
 
     const Pause pause(host.GetPump());
-    host::Progress& progress = *host.GetProgress();
-    progress.ConnectProgressActivity(loadingData, host.GetTexts().GetText(textLoadingData),
-                                     base::Wide(base::NativePath(path).filename().string()));
-    point->SetProgressBarActivityID(loadingData);
-    const bool configured = point->Configure(L"MDF", path, 1, 0) != 0;
-    progress.DisconnectProgressActivity(loadingData);
+    const bool configured = hosts::LoadMotionData(*point, path, *host.GetProgress(), host.GetTexts());
 
     const bool explained = point->GetMessageStack() != nullptr;
     if (explained)
@@ -198,11 +189,11 @@ bool SceneFiles::LoadData(const std::wstring& path)
     if (!configured)
     {
         if (!explained)
-            app.GetMessageHandler().ShowError(messageDataUnusable, FromQt(ShownPath(path)));
+            app.GetMessageHandler().ShowError(hosts::messageDataUnusable, FromQt(ShownPath(path)));
         return false;
     }
-    controller->ChoosePoint(filePoint);
-    controller->GetRouter().NotifyConfiguration(controller->GetRouter().GetConfigurationText(filePoint, 0));
+    controller->ChoosePoint(hosts::filePoint);
+    controller->GetRouter().NotifyConfiguration(controller->GetRouter().GetConfigurationText(hosts::filePoint, 0));
     controller->GotoFirst();
     dataPath = path;
     Remember(path);
