@@ -74,7 +74,8 @@ class Application:
             if time.monotonic() > deadline:
                 self.screen.save(Path(os.environ.get("PANORAMIC_TEST_PICTURES", tempfile.gettempdir())) /
                                  "desktop-timeout.png")
-                raise AssertionError(f"not within {seconds} s: {what}")
+                told = {key: value for key, value in state.items() if key not in ("actions", "menu_bar", "log")}
+                raise AssertionError(f"not within {seconds} s: {what}\nlast state: {json.dumps(told)}")
             time.sleep(0.05)
 
     def wait_for_pictures(self) -> State:
