@@ -104,8 +104,17 @@ std::wstring ToLower(std::wstring_view text)
 
 bool EqualsNoCase(std::wstring_view a, std::wstring_view b)
 {
-    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
-                      [](wchar_t x, wchar_t y) { return x == y || Lower(x) == Lower(y); });
+    return a == b || std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                                [](wchar_t x, wchar_t y) { return x == y || Lower(x) == Lower(y); });
+}
+
+std::size_t NoCaseHash::operator()(std::wstring_view text) const
+{
+    // FNV-1a, by characters instead of bytes.
+    std::uint64_t hash = 14695981039346656037U;
+    for (const wchar_t c : text)
+        hash = (hash ^ static_cast<std::uint64_t>(Lower(c))) * 1099511628211U;
+    return hash;
 }
 
 std::vector<std::wstring> Split(std::wstring_view text, wchar_t separator)

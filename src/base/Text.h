@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -18,6 +19,16 @@ std::wstring Wide(std::string_view utf8);
 std::wstring ToLower(std::wstring_view text);
 
 bool EqualsNoCase(std::wstring_view a, std::wstring_view b);
+
+/// For tables whose keys are found without regard to case.
+struct NoCaseHash
+{
+    std::size_t operator()(std::wstring_view text) const;
+};
+struct NoCaseEqual
+{
+    bool operator()(std::wstring_view a, std::wstring_view b) const { return EqualsNoCase(a, b); }
+};
 
 /// Splits at every `separator`, keeping empty fields; an empty text gives no fields.
 std::vector<std::wstring> Split(std::wstring_view text, wchar_t separator);

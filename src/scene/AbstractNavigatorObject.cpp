@@ -10,6 +10,8 @@
 #include <algorithm>
 #include <utility>
 
+using namespace std::string_view_literals;
+
 namespace
 {
 
@@ -98,10 +100,12 @@ void VtCGlidePanelAbstractNavigatorObject::ApplyAttributes(VtISceneObject& sourc
     {
         const std::wstring& name = attribute->GetName();
         const VtTAttributeValue value = attribute->GetValue();
-        MergeAttribute(name, value);
+        // A loaded object takes `source` itself over afterwards, in place of the record that it was made with.
+        if (!loading)
+            MergeAttribute(name, value);
         OnAttributeChanged(internalId, name, value);
     }
-    if (attributeObject)
+    if (attributeObject && !loading)
         GetServices().store.AddObject(internalId, attributeObject);
 }
 
@@ -214,9 +218,9 @@ void VtCGlidePanelAbstractNavigatorObject::MergeAttribute(const std::wstring& na
     if (!attributeObject)
         return;
     const OwnWrite guard(writing);
-    const VtISceneAttribute* present = attributeObject->GetAttribute(name);
+    VtISceneAttribute* present = attributeObject->GetAttribute(name);
     if (present && present->GetValue().index() == value.index())
-        attributeObject->Write(name, value);
+        present->SetValue(value);
     else
         attributeObject->AddAttribute(name, value);
 }

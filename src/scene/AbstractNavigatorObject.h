@@ -29,7 +29,8 @@ public:
     /// Format of the object's section in a settings file, empty for objects without one.
     virtual std::wstring GetSectionFormat() const { return {}; }
 
-    /// Merges `source` into the object's own record and applies every attribute, in the order of `source`.
+    /// Merges `source` into the object's own record and applies every attribute, in the order of `source`. While
+    /// `IsLoading` it only applies them, for the loader has the object take `source` over by `RebindAttributes`.
     virtual void ApplyAttributes(VtISceneObject& source);
 
     /// A new default record of the type of `source` with every value of `source` that it has room for; null when

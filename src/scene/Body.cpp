@@ -9,6 +9,8 @@
 #include "scene/SceneServices.h"
 #include "scene/UserData.h"
 
+using namespace std::string_view_literals;
+
 namespace
 {
 
@@ -106,11 +108,11 @@ void VtC3DBody::OnAttributeChanged(const std::wstring& objectId, const std::wstr
                                    const VtTAttributeValue& value)
 {
     const std::int32_t* flag = std::get_if<std::int32_t>(&value);
-    if (flag && attributeName == L"selectable")
+    if (flag && attributeName == L"selectable"sv)
         selectable = *flag > 0;
-    else if (flag && attributeName == L"fixed_to_world")
+    else if (flag && attributeName == L"fixed_to_world"sv)
         fixedToWorld = *flag > 0;
-    else if (flag && attributeName == L"visible")
+    else if (flag && attributeName == L"visible"sv)
         SetVisible(*flag > 0);
     else
         VtCGlidePanelAbstractNavigatorObject::OnAttributeChanged(objectId, attributeName, value);
@@ -123,7 +125,7 @@ void VtC3DBody::Destroy()
     DetachFromParent();
 }
 
-void VtC3DBody::MakeAttributeObject(const std::string& description, std::int32_t objectType)
+void VtC3DBody::MakeAttributeObject(const std::string& description, std::int32_t objectType, bool recordFollows)
 {
     VtTSceneServices& services = GetServices();
     if (!description.empty())
@@ -133,7 +135,7 @@ void VtC3DBody::MakeAttributeObject(const std::string& description, std::int32_t
         if (!attributeObject)
             services.messages.ShowWarning(messageBadDescription, filePath, parsed.error);
     }
-    if (!attributeObject)
+    if (!attributeObject && !recordFollows)
         attributeObject = services.store.MakeDefaultObject(objectType);
 }
 

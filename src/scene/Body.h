@@ -168,7 +168,7 @@ protected:
 
     /// Makes the record from `description` (UTF-8, may be empty), or from the default text of `objectType` when there
     /// is none or it isn't a record. That is reported as a warning.
-    void MakeAttributeObject(const std::string& description, std::int32_t objectType);
+    void MakeAttributeObject(const std::string& description, std::int32_t objectType, bool recordFollows);
 
     void AddMissingDyeAttributes();
 

@@ -37,7 +37,7 @@ bool AllFinite(const std::vector<float>& values)
 VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                                    const std::wstring& name, const std::wstring& path,
                                    const osg::Matrixd& insertTransform, bool inTree, osg::Node* model,
-                                   const std::wstring& id)
+                                   const std::wstring& id, bool recordFollows)
     : VtC3DBody(owningDocument, &parentObject, name, path, inTree, id)
 {
     JoinParent();
@@ -58,7 +58,7 @@ VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePan
     if (dynamic_cast<VtC3DMovableBody*>(&parentObject))
         attributeObject = services.store.GetObject(internalId);
     if (!attributeObject)
-        MakeAttributeObject(description, objectTypeMovableBody);
+        MakeAttributeObject(description, objectTypeMovableBody, recordFollows);
     if (attributeObject)
         FillAttributes(insertTransform);
     PublishAttributes();

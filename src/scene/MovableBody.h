@@ -27,10 +27,11 @@ public:
 
     /// Belongs to `parent` (a collection, or the group that it becomes a part of). `path` is a complete path;
     /// `insertTransform` places a grouped body as a whole; `model` is used in place of the file if it isn't null. An
-    /// empty `id` gives a fresh one. A file that can't be read leaves the body without geometry.
+    /// empty `id` gives a fresh one. With `recordFollows` no default record is made, for a stored one is applied and
+    /// taken over next. A file that can't be read leaves the body without geometry.
     VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                      const std::wstring& name, const std::wstring& path, const osg::Matrixd& insertTransform,
-                     bool inTree, osg::Node* model, const std::wstring& id);
+                     bool inTree, osg::Node* model, const std::wstring& id, bool recordFollows = false);
 
     /// Binds the body to the channel `index`, -1 for none. An empty `stream` is named by the data point, or by the
     /// index. A group ignores it: its parts have channels of their own.

@@ -6,6 +6,8 @@
 
 #include <algorithm>
 
+using namespace std::string_view_literals;
+
 namespace
 {
 
@@ -35,7 +37,7 @@ void VtC3DMovableBody::ConnectChannel(std::int32_t index, const std::wstring& st
     UpdateConnectionState();
     SetModified();
 
-    if (!attributeObject)
+    if (!attributeObject && !IsLoading())
         return;
     const std::vector<std::wstring>* channels = CurrentChannels(services);
     if (channels && index >= 0 && static_cast<std::size_t>(index) < channels->size() &&
@@ -80,7 +82,7 @@ void VtC3DMovableBody::OnAttributeChanged(const std::wstring& objectId, const st
     const std::vector<float>* list = std::get_if<std::vector<float>>(&value);
     const bool isMatrix = list && list->size() == 16;
 
-    if (attributeName == L"transparency" && real)
+    if (attributeName == L"transparency"sv && real)
     {
         if (GetGlobalMode() != VtERenderMode::Mixed)
             return;
@@ -88,44 +90,44 @@ void VtC3DMovableBody::OnAttributeChanged(const std::wstring& objectId, const st
         ApplyStoredDye();
         ApplyTransparency(GetRenderMode());
     }
-    else if (attributeName == L"position" && vector)
+    else if (attributeName == L"position"sv && vector)
     {
         SetCenterX((*vector)[0]);
         SetCenterY((*vector)[1]);
         SetCenterZ((*vector)[2]);
     }
-    else if (attributeName == L"rotation" && vector)
+    else if (attributeName == L"rotation"sv && vector)
     {
         SetRotationX((*vector)[0]);
         SetRotationY(-(*vector)[1]);
         SetRotationZ((*vector)[2]);
     }
-    else if (attributeName == L"scale" && vector)
+    else if (attributeName == L"scale"sv && vector)
     {
         SetScaleX((*vector)[0] * 100);
         SetScaleY((*vector)[2] * 100);
         SetScaleZ((*vector)[1] * 100);
     }
-    else if (attributeName == L"render_mode" && integer)
+    else if (attributeName == L"render_mode"sv && integer)
     {
         SetRenderMode(static_cast<VtERenderMode>(*integer));
         ApplyStoredDye();
         ApplyTransparency(GetRenderMode());
     }
-    else if (attributeName == L"simulation_data_stream" && integer)
+    else if (attributeName == L"simulation_data_stream"sv && integer)
         ConnectChannel(*integer, {});
-    else if (const auto* text = std::get_if<std::wstring>(&value); text && attributeName == L"simulation_data_index")
+    else if (const auto* text = std::get_if<std::wstring>(&value); text && attributeName == L"simulation_data_index"sv)
         OnChannelNameChanged(*text);
-    else if (attributeName == L"last_transform_matrix" && isMatrix)
+    else if (attributeName == L"last_transform_matrix"sv && isMatrix)
         SetTransform(osg::Matrixd(list->data()));
-    else if (attributeName == L"insert_transform_matrix" && isMatrix)
+    else if (attributeName == L"insert_transform_matrix"sv && isMatrix)
         SetInsertMatrix(osg::Matrixd(list->data()));
-    else if (attributeName == L"dye_enabled" && integer)
+    else if (attributeName == L"dye_enabled"sv && integer)
     {
         dye->enabled = *integer > 0 ? 1 : 0;
         RefreshAppearance();
     }
-    else if (const auto* colour = std::get_if<VtTIntTupel3>(&value); colour && attributeName == L"dye_color")
+    else if (const auto* colour = std::get_if<VtTIntTupel3>(&value); colour && attributeName == L"dye_color"sv)
     {
         StoreDyeColour(*colour);
         if (dye->enabled != 0)

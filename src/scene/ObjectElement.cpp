@@ -51,7 +51,7 @@ VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const VtTAttribut
     const pugi::xml_attribute told = node.attribute("type");
     if (!told)
         return rules.assumedType;
-    const VtEAttributeType type = AttributeTypeFromName(base::Wide(told.value()));
+    const VtEAttributeType type = AttributeTypeFromName(std::string_view(told.value()));
     if (rules.fixedType && *rules.fixedType != type)
         throw VtCAttributeError("its type is " + base::Utf8(AttributeTypeName(*rules.fixedType)) + ", not " +
                                 told.value());
@@ -189,20 +189,20 @@ const VtTAttributeRules& VtCObjectReader::RulesOf(std::string_view name)
     const auto at = rules.find(name);
     if (at != rules.end())
         return at->second;
-    std::wstring wide = base::Wide(name);
-    VtTAttributeRules made{wide, FixedAttributeType(wide), AssumedAttributeType(wide), FixedListLength(wide)};
+    const std::wstring wide = base::Wide(name);
+    VtTAttributeRules made{ShareAttributeName(wide), FixedAttributeType(wide), AssumedAttributeType(wide),
+                           FixedListLength(wide)};
     return rules.emplace(name, std::move(made)).first->second;
 }
 
 void VtCObjectReader::ReadAttribute(const pugi::xml_node& node, VtISceneObject& object)
 {
     const VtTAttributeRules& rulesOfName = RulesOf(node.attribute("name").value());
-    if (rulesOfName.name.empty())
+    if (rulesOfName.name->empty())
         RefuseNode(node, "an attribute has no name");
-    if (object.GetAttribute(rulesOfName.name))
-        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\" is there twice");
     if (object.GetAttributes().size() >= mostAttributes)
         RefuseNode(node, "more than " + std::to_string(mostAttributes) + " attributes");
+    bool isNew = false;
     try
     {
         VtTAttributeValue value = ReadValue(node, ReadAttributeType(node, rulesOfName));
@@ -211,12 +211,14 @@ void VtCObjectReader::ReadAttribute(const pugi::xml_node& node, VtISceneObject& 
         if (length && list->size() != *length)
             throw VtCAttributeError("it holds " + std::to_string(list->size()) + " numbers, not " +
                                     std::to_string(*length));
-        object.AddAttribute(rulesOfName.name, std::move(value));
+        isNew = object.AddNewAttribute(rulesOfName.name, std::move(value));
     }
     catch (const VtCAttributeError& error)
     {
         RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\": " + error.what());
     }
+    if (!isNew)
+        RefuseNode(node, "attribute \"" + Shortened(node.attribute("name").value()) + "\" is there twice");
 }
 
 osg::ref_ptr<VtISceneObject> VtCObjectReader::Read(const pugi::xml_node& element, const pugi::xml_node& parent,

@@ -46,7 +46,7 @@ std::string Shortened(const char* text);
 /// What the name of an attribute says by itself.
 struct VtTAttributeRules
 {
-    std::wstring name;
+    VtTAttributeName name;
     std::optional<VtEAttributeType> fixedType;
     VtEAttributeType assumedType; ///< when the text tells none
     std::optional<std::size_t> fixedLength;

@@ -8,7 +8,7 @@
 #include <cmath>
 #include <limits>
 #include <optional>
-#include <unordered_set>
+#include <unordered_map>
 #include <utility>
 
 namespace
@@ -139,18 +139,6 @@ void CheckFinite(const std::wstring& name, const VtTAttributeValue& value)
         Refuse("attribute " + Quoted(base::Utf8(name)) + " takes finite numbers only");
 }
 
-// All records share a few names, which take more room than most values. Null once there are too many of them: names
-// come from files too.
-const std::wstring* CommonName(const std::wstring& name)
-{
-    constexpr std::size_t mostNames = 500;
-    static std::unordered_set<std::wstring> names;
-    const auto at = names.find(name);
-    if (at != names.end())
-        return &*at;
-    return names.size() < mostNames ? &*names.insert(name).first : nullptr;
-}
-
 } // namespace
 
 std::wstring_view AttributeTypeName(VtEAttributeType type)
@@ -160,10 +148,16 @@ std::wstring_view AttributeTypeName(VtEAttributeType type)
 
 VtEAttributeType AttributeTypeFromName(std::wstring_view typeName)
 {
+    return AttributeTypeFromName(base::Utf8(typeName));
+}
+
+VtEAttributeType AttributeTypeFromName(std::string_view typeName)
+{
     for (std::size_t i = 0; i < std::size(typeNames); ++i)
-        if (typeNames[i] == typeName)
+        if (std::equal(typeNames[i].begin(), typeNames[i].end(), typeName.begin(), typeName.end(),
+                       [](wchar_t wide, char narrow) { return wide == static_cast<wchar_t>(narrow); }))
             return static_cast<VtEAttributeType>(i);
-    Refuse(Quoted(base::Utf8(typeName)) + " is not a type of attributes");
+    Refuse(Quoted(typeName) + " is not a type of attributes");
 }
 
 VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::wstring_view text)
@@ -196,7 +190,9 @@ VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::string_view
     case VtEAttributeType::intTupel3:
         return TupleFromText<VtTIntTupel3>(text, IntegerFromText);
     default:
+        constexpr std::size_t usualLength = 16; // a matrix
         std::vector<float> list;
+        list.reserve(usualLength);
         ForEachWord(text, [&](std::string_view word) { list.push_back(RealFromText(word)); });
         return list;
     }
@@ -216,16 +212,24 @@ std::string AttributeValueToUtf8(const VtTAttributeValue& value)
     return std::visit(ToUtf8(), value);
 }
 
-VtISceneAttribute::VtISceneAttribute(const std::wstring& attributeName, VtTAttributeValue attributeValue)
-    : name(CommonName(attributeName)), value(std::move(attributeValue))
+VtTAttributeName ShareAttributeName(const std::wstring& name)
 {
-    if (attributeName.empty())
+    constexpr std::size_t mostNames = 500; // they come from files too
+    static std::unordered_map<std::wstring_view, VtTAttributeName> names;
+    const auto at = names.find(name);
+    if (at != names.end())
+        return at->second;
+    auto made = std::make_shared<const std::wstring>(name);
+    if (names.size() < mostNames)
+        names.emplace(*made, made);
+    return made;
+}
+
+VtISceneAttribute::VtISceneAttribute(VtTAttributeName attributeName, VtTAttributeValue attributeValue)
+    : name(std::move(attributeName)), value(std::move(attributeValue))
+{
+    if (name->empty())
         Refuse("an attribute needs a name");
-    if (!name)
-    {
-        ownName = std::make_unique<const std::wstring>(attributeName);
-        name = ownName.get();
-    }
     CheckFinite(*name, value);
 }
 

@@ -43,6 +43,7 @@ public:
 /// The name of `type` in records, and back; an unknown name throws `VtCAttributeError`.
 std::wstring_view AttributeTypeName(VtEAttributeType type);
 VtEAttributeType AttributeTypeFromName(std::wstring_view typeName);
+VtEAttributeType AttributeTypeFromName(std::string_view typeName); // in UTF-8
 
 /// The value that `text` stands for. Numbers are decimal with a point, those of a tuple or list separated by blanks;
 /// a list of texts has one entry a line. Throws `VtCAttributeError` when `text` isn't such a value.
@@ -55,11 +56,17 @@ VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::string_view
 std::wstring AttributeValueToText(const VtTAttributeValue& value);
 std::string AttributeValueToUtf8(const VtTAttributeValue& value);
 
+/// The name of an attribute. All records share a few names, which take more room than most values.
+using VtTAttributeName = std::shared_ptr<const std::wstring>;
+
+/// The one copy of `name` that the attributes of this name share; a copy of its own if there are too many names.
+VtTAttributeName ShareAttributeName(const std::wstring& name);
+
 /// One named value of a record. The type is fixed when it is made.
 class VtISceneAttribute : public osg::Referenced
 {
 public:
-    VtISceneAttribute(const std::wstring& attributeName, VtTAttributeValue attributeValue);
+    VtISceneAttribute(VtTAttributeName attributeName, VtTAttributeValue attributeValue);
 
     const std::wstring& GetName() const { return *name; }
     VtEAttributeType GetType() const { return static_cast<VtEAttributeType>(value.index()); }
@@ -76,8 +83,7 @@ public:
 private:
     friend class VtISceneObject;
 
-    const std::wstring* name;                    ///< the copy that all attributes of a common name share, or `ownName`
-    std::unique_ptr<const std::wstring> ownName; ///< null for a common name
+    VtTAttributeName name;
     VtTAttributeValue value;
     VtISceneObject* owner = nullptr; ///< null once the record has let it go
 };

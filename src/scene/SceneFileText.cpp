@@ -20,7 +20,9 @@ constexpr int deepestElement = 4; // scene, object, attribute, value
 constexpr int mostQuotes = 12;    // six XML attributes in one tag
 constexpr std::size_t deepestAncestor = 1000;
 
-constexpr std::string_view elementNames[] = {"vtattr:Scene", "vtattr:Object", "vtattr:Attribute", "vtattr:value"};
+constexpr std::string_view sceneElementName = "vtattr:Scene";
+constexpr std::string_view elementNames[] = {"vtattr:value", "vtattr:Attribute", objectElementName,
+                                             sceneElementName}; // frequent ones first
 
 [[noreturn]] void Refuse(std::size_t at, const std::string& reason)
 {
@@ -45,15 +47,18 @@ std::size_t SequenceLength(std::string_view text, std::size_t at)
     return 0;
 }
 
-// The first place at or behind `at` that doesn't hold a byte from 1 to 127; eight bytes at a time.
+// The first place at or behind `at` that doesn't hold a byte from 1 to 127; 32 bytes at a time.
 std::size_t EndOfAscii(std::string_view text, std::size_t at)
 {
     constexpr std::uint64_t ones = 0x0101010101010101;
     constexpr std::uint64_t highBits = 0x8080808080808080;
-    for (std::uint64_t bytes; at + sizeof bytes <= text.size(); at += sizeof bytes)
+    for (std::uint64_t words[4]; at + sizeof words <= text.size(); at += sizeof words)
     {
-        std::memcpy(&bytes, text.data() + at, sizeof bytes);
-        if ((bytes | (bytes - ones)) & highBits) // set by bytes from 128 up, and borrowed by bytes of 0
+        std::memcpy(words, text.data() + at, sizeof words);
+        std::uint64_t marks = 0;
+        for (const std::uint64_t word : words)
+            marks |= word | (word - ones); // the high bits are set by bytes from 128 up, and borrowed by bytes of 0
+        if (marks & highBits)
             break;
     }
     while (at < text.size() && static_cast<signed char>(text[at]) > 0)
@@ -95,17 +100,11 @@ public:
 private:
     std::size_t Pass(std::size_t at)
     {
-        const std::string_view rest = text.substr(at);
-        if (rest.starts_with("<!--"))
-            return Behind("-->", at + 4);
-        if (rest.starts_with("<![CDATA["))
-            return Behind("]]>", at + 9);
-        if (rest.starts_with("<?"))
-            return Behind("?>", at + 2);
-        if (rest.starts_with("<!"))
-            Refuse(at, "a document type is not allowed");
+        const char next = at + 1 < text.size() ? text[at + 1] : '\0';
+        if (next == '!' || next == '?')
+            return PassOther(at);
 
-        const bool closes = rest.starts_with("</");
+        const bool closes = next == '/';
         const std::size_t nameAt = at + (closes ? 2 : 1);
         const auto endsName = [](char c)
         { return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '/' || c == '>'; };
@@ -129,6 +128,18 @@ private:
         else if (++depth > deepestElement)
             Refuse(at, "element <" + std::string(name) + "> is nested too deeply");
         return EndOfTag(at, nameEnd);
+    }
+
+    std::size_t PassOther(std::size_t at) const
+    {
+        const std::string_view rest = text.substr(at);
+        if (rest.starts_with("<!--"))
+            return Behind("-->", at + 4);
+        if (rest.starts_with("<![CDATA["))
+            return Behind("]]>", at + 9);
+        if (rest.starts_with("<?"))
+            return Behind("?>", at + 2);
+        Refuse(at, "a document type is not allowed");
     }
 
     // A ">" in quotes belongs to a value.
@@ -178,14 +189,14 @@ public:
         const auto* id = object.Find<std::wstring>(L"internal_id");
         if (!id || id->empty())
             return;
-        const auto [at, isNew] = records.try_emplace(base::ToLower(*id), Record{offset, {}, 0});
+        const auto [at, isNew] = records.try_emplace(*id, Record{offset, {}, 0});
         if (!isNew)
             throw VtTTextFault{offset, "a record of the id \"" + Shortened(base::Utf8(*id).c_str()) +
                                            "\" is there already, in line " +
                                            std::to_string(LineOf(at->second.offset, text))};
         if (object.GetObjectType() == objectTypeStaticBody)
             if (const auto* parent = object.Find<std::wstring>(L"parent_object_id"))
-                at->second.parent = base::ToLower(*parent);
+                at->second.parent = *parent;
     }
 
     // Each record is passed once: where a known level is reached, the rest of the way is known.
@@ -227,7 +238,7 @@ private:
     }
 
     std::string_view text;
-    std::unordered_map<std::wstring, Record> records;
+    std::unordered_map<std::wstring, Record, base::NoCaseHash, base::NoCaseEqual> records;
 };
 
 pugi::xml_node FindScene(const pugi::xml_document& document)
@@ -242,7 +253,7 @@ pugi::xml_node FindScene(const pugi::xml_document& document)
         }
         else if (IsElement(node))
         {
-            if (scene || std::string_view(node.name()) != elementNames[0])
+            if (scene || node.name() != sceneElementName)
                 RefuseContent(node);
             scene = node;
         }

@@ -237,7 +237,7 @@ void VtCSceneLoader::BuildMovableBody(VtISceneObject& record)
     const std::wstring& path = FindModelOrReport(name, Needed(record, L"file_path"));
     Describe(name);
     auto* body = new VtC3DMovableBody(scene.GetDocument(), *scene.GetMovableBodies(0), name, path, osg::Matrixd(), true,
-                                      nullptr, {});
+                                      nullptr, {}, true);
     {
         const Loading loading(*body);
         body->ApplyAttributes(record);
@@ -260,7 +260,7 @@ void VtCSceneLoader::BuildStaticBodies()
 // A table of its own: the search through the tree for each record would take the square of their number.
 void VtCSceneLoader::RememberStatic(VtCGlidePanelAbstractNavigatorObject& body)
 {
-    staticById.emplace(base::ToLower(body.GetInternalId()), &body);
+    staticById.emplace(body.GetInternalId(), &body);
 }
 
 void VtCSceneLoader::BuildStaticBody(VtISceneObject& record)
@@ -268,13 +268,13 @@ void VtCSceneLoader::BuildStaticBody(VtISceneObject& record)
     const std::wstring name = Needed(record, L"name");
     const std::wstring& path = FindModelOrReport(name, Needed(record, L"file_path"));
     const std::wstring id = Needed(record, L"internal_id");
-    const auto at = staticById.find(base::ToLower(TextOf(record, L"parent_object_id")));
+    const auto at = staticById.find(TextOf(record, L"parent_object_id"));
     VtCGlidePanelAbstractNavigatorObject* parent = scene.GetStaticBodies();
     if (at != staticById.end())
         parent = at->second;
 
     Describe(name);
-    auto* body = new VtC3DStaticBody(scene.GetDocument(), *parent, name, path, osg::Matrixd(), true, {});
+    auto* body = new VtC3DStaticBody(scene.GetDocument(), *parent, name, path, osg::Matrixd(), true, {}, true);
     {
         const Loading loading(*body);
         body->ApplyAttributes(record);

@@ -6,6 +6,7 @@
 
 #include <osg/ref_ptr>
 
+#include "base/Text.h"
 #include "scene/SceneObject.h"
 
 class VtC3DStaticBody;
@@ -68,6 +69,7 @@ private:
     Records defaultObservers;
     Records staticBodies;
     Records movableBodies;
-    std::unordered_map<std::wstring, VtCGlidePanelAbstractNavigatorObject*> staticById; ///< keys in lower case
+    std::unordered_map<std::wstring, VtCGlidePanelAbstractNavigatorObject*, base::NoCaseHash, base::NoCaseEqual>
+        staticById;
     std::unordered_map<std::wstring, ModelFile> modelFiles; ///< by the stored path; a scene shows few models often
 };

@@ -10,6 +10,12 @@ namespace
 constexpr std::size_t fewAttributes = 40;
 constexpr std::size_t usualAttributes = 24;
 
+// Names are mostly one shared text, and those of equal length mostly end differently.
+bool IsSameName(std::wstring_view a, std::wstring_view b)
+{
+    return a.size() == b.size() && (a.empty() || a.data() == b.data() || (a.back() == b.back() && a == b));
+}
+
 } // namespace
 
 VtISceneObject::VtISceneObject(std::int32_t objectType) : type(objectType)
@@ -28,7 +34,7 @@ VtISceneAttribute* VtISceneObject::GetAttribute(std::wstring_view name) const
     if (byName.empty())
     {
         for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
-            if (attribute->GetName() == name)
+            if (IsSameName(attribute->GetName(), name))
                 return attribute.get();
         return nullptr;
     }
@@ -52,20 +58,35 @@ void VtISceneObject::AddAttribute(std::wstring_view typeName, std::wstring_view 
 
 void VtISceneObject::AddAttribute(const std::wstring& name, VtTAttributeValue value)
 {
-    const osg::ref_ptr<VtISceneAttribute> attribute = new VtISceneAttribute(name, std::move(value));
+    VtISceneAttribute* old = GetAttribute(name);
+    if (!old)
+    {
+        Append(ShareAttributeName(name), std::move(value));
+        return;
+    }
+    const osg::ref_ptr<VtISceneAttribute> attribute = new VtISceneAttribute(old->name, std::move(value));
     attribute->owner = this;
-    if (VtISceneAttribute* old = GetAttribute(name))
-    {
-        old->owner = nullptr;
-        if (byName.erase(name) > 0)
-            byName.emplace(attribute->GetName(), attribute.get());
-        *std::find(attributes.begin(), attributes.end(), old) = attribute;
-    }
-    else
-    {
-        attributes.push_back(attribute);
-        Index();
-    }
+    old->owner = nullptr;
+    if (byName.erase(name) > 0)
+        byName.emplace(attribute->GetName(), attribute.get());
+    *std::find(attributes.begin(), attributes.end(), old) = attribute;
+    Fire(*attribute);
+}
+
+bool VtISceneObject::AddNewAttribute(VtTAttributeName name, VtTAttributeValue value)
+{
+    if (GetAttribute(*name))
+        return false;
+    Append(std::move(name), std::move(value));
+    return true;
+}
+
+void VtISceneObject::Append(VtTAttributeName name, VtTAttributeValue value)
+{
+    const osg::ref_ptr<VtISceneAttribute> attribute = new VtISceneAttribute(std::move(name), std::move(value));
+    attribute->owner = this;
+    attributes.push_back(attribute);
+    Index();
     Fire(*attribute);
 }
 
@@ -84,7 +105,7 @@ void VtISceneObject::Write(const std::wstring& name, VtTAttributeValue value)
     if (VtISceneAttribute* attribute = GetAttribute(name))
         attribute->SetValue(std::move(value));
     else
-        AddAttribute(name, std::move(value));
+        Append(ShareAttributeName(name), std::move(value));
 }
 
 void VtISceneObject::Advise(IPropertyChangedCOMEvents& listener)

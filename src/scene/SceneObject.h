@@ -46,6 +46,9 @@ public:
     void AddAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name);
     void AddAttribute(const std::wstring& name, VtTAttributeValue value);
 
+    /// The same, but one of that name stays as it is; false then.
+    bool AddNewAttribute(VtTAttributeName name, VtTAttributeValue value);
+
     void RemoveAttribute(std::wstring_view name);
 
     /// Sets the attribute, or adds it with the type of `value` when there is none.
@@ -69,6 +72,7 @@ protected:
 private:
     friend class VtISceneAttribute;
 
+    void Append(VtTAttributeName name, VtTAttributeValue value); // one that isn't there
     void Index();
     void Fire(VtISceneAttribute& attribute);
 

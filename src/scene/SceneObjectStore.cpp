@@ -28,9 +28,11 @@ std::string ReadWhole(const std::filesystem::path& path, std::string& content)
     std::ifstream file(path, std::ios::binary);
     if (!file)
         return std::strerror(errno);
-    // Without a size (a pipe), or with a wrong one, it grows as it is read.
     const std::uintmax_t size = std::filesystem::file_size(path, failure);
-    content.reserve(failure ? 0 : static_cast<std::size_t>(std::min<std::uintmax_t>(size, largestSceneText)) + 1);
+    content.resize(failure ? 0 : static_cast<std::size_t>(std::min<std::uintmax_t>(size, largestSceneText)));
+    file.read(content.data(), static_cast<std::streamsize>(content.size()));
+    content.resize(static_cast<std::size_t>(file.gcount()));
+    // Without a size (a pipe), or with a wrong one, it grows as it is read.
     char part[1 << 16];
     while (content.size() <= largestSceneText && (file.read(part, sizeof part) || file.gcount() > 0))
         content.append(part, static_cast<std::size_t>(file.gcount()));
@@ -55,13 +57,13 @@ VtTParsedObject VtCSceneObjectStore::ParseObject(const std::wstring& text) const
 
 VtISceneObject* VtCSceneObjectStore::GetObject(const std::wstring& id) const
 {
-    const auto at = byId.find(base::ToLower(id));
+    const auto at = byId.find(id);
     return at == byId.end() ? nullptr : at->second->second.get();
 }
 
 void VtCSceneObjectStore::RemoveObject(const std::wstring& id)
 {
-    const auto at = byId.find(base::ToLower(id));
+    const auto at = byId.find(id);
     if (at == byId.end())
         return;
     records.erase(at->second);
@@ -81,12 +83,11 @@ void VtCSceneObjectStore::AddObject(const std::wstring& id, VtISceneObject* obje
         RemoveObject(id);
         return;
     }
-    const std::wstring key = base::ToLower(id);
-    const auto at = byId.find(key);
-    if (at != byId.end())
-        at->second->second = object;
+    const auto [at, isNew] = byId.try_emplace(id);
+    if (isNew)
+        at->second = records.emplace(records.end(), id, object);
     else
-        byId.emplace(key, records.emplace(records.end(), key, object));
+        at->second->second = object;
 }
 
 std::wstring VtCSceneObjectStore::GetDefaultText(std::int32_t objectType) const
@@ -160,14 +161,13 @@ void VtCSceneObjectStore::PartIds()
         return at != byId.end() && base::EqualsNoCase(idOf(*at->second->second), key);
     };
 
-    std::unordered_set<std::wstring> edited;
+    std::unordered_set<std::wstring, base::NoCaseHash, base::NoCaseEqual> edited;
     for (const auto& [key, object] : records)
     {
         const std::wstring& id = idOf(*object);
         if (id.empty() || base::EqualsNoCase(id, key))
             continue;
-        const std::wstring lower = base::ToLower(id);
-        if (!isKept(lower) && edited.insert(lower).second)
+        if (!isKept(id) && edited.insert(id).second)
             continue;
         object->Write(L"internal_id", edited.contains(key) ? base::NewId() : key);
     }

@@ -10,6 +10,7 @@
 
 #include <osg/ref_ptr>
 
+#include "base/Text.h"
 #include "scene/SceneObject.h"
 
 /// A record made from text, or the reason why there is none.
@@ -107,7 +108,7 @@ private:
     using Records = std::list<std::pair<std::wstring, osg::ref_ptr<VtISceneObject>>>;
 
     Records records;
-    std::unordered_map<std::wstring, Records::iterator> byId; ///< keys in lower case
+    std::unordered_map<std::wstring, Records::iterator, base::NoCaseHash, base::NoCaseEqual> byId;
     std::wstring fileError;
     VtIPropertyGrid* grid = nullptr;
 };

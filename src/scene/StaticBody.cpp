@@ -27,7 +27,8 @@ constexpr std::size_t neededParameters = 3;
 
 VtC3DStaticBody::VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                                  const std::wstring& name, const std::wstring& path,
-                                 const osg::Matrixd& insertTransform, bool inTree, const std::wstring& id)
+                                 const osg::Matrixd& insertTransform, bool inTree, const std::wstring& id,
+                                 bool recordFollows)
     : VtC3DBody(owningDocument, &parentObject, name, path, inTree, id)
 {
     VtIModelLibrary& models = GetServices().models;
@@ -41,7 +42,7 @@ VtC3DStaticBody::VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanel
     if (parentNode)
         parentNode->addChild(transform);
 
-    MakeAttributeObject(models.getXmlAttributes(path), objectTypeStaticBody);
+    MakeAttributeObject(models.getXmlAttributes(path), objectTypeStaticBody, recordFollows);
     if (attributeObject)
         FillAttributes(insertTransform);
     PublishAttributes();

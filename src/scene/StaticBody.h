@@ -13,10 +13,11 @@ class VtC3DStaticBody final : public VtC3DBody
 public:
     /// Belongs to `parentObject` (the collection, or a static body). `path` is a complete path; an empty `id` gives a
     /// fresh one. The node has the matrix `insertTransform` until a placement value changes or `UpdateBaseTransform`
-    /// is called. Throws `VtCAttributeError` when `insertTransform` holds no finite numbers.
+    /// is called. With `recordFollows` no default record is made, for a stored one is applied and taken over next.
+    /// Throws `VtCAttributeError` when `insertTransform` holds no finite numbers.
     VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                     const std::wstring& name, const std::wstring& path, const osg::Matrixd& insertTransform,
-                    bool inTree, const std::wstring& id);
+                    bool inTree, const std::wstring& id, bool recordFollows = false);
 
     void UpdateBaseTransform() override;
 

@@ -1,5 +1,7 @@
 #include "scene/StaticBody.h"
 
+using namespace std::string_view_literals;
+
 void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
                                          const VtTAttributeValue& value)
 {
@@ -8,12 +10,12 @@ void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std
     const VtTFloatTupel3* vector = std::get_if<VtTFloatTupel3>(&value);
 
     if (integer &&
-        (attributeName == L"selectable" || attributeName == L"fixed_to_world" || attributeName == L"visible"))
+        (attributeName == L"selectable"sv || attributeName == L"fixed_to_world"sv || attributeName == L"visible"sv))
     {
         VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
         SetModified();
     }
-    else if (attributeName == L"transparency" && real)
+    else if (attributeName == L"transparency"sv && real)
     {
         if (GetGlobalMode() != VtERenderMode::Mixed)
             return;
@@ -22,37 +24,37 @@ void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std
             ApplyStoredDye();
         ApplyTransparency(GetRenderMode());
     }
-    else if (attributeName == L"position" && vector)
+    else if (attributeName == L"position"sv && vector)
     {
         const osg::Vec3f axes = ToModelAxes(*vector);
         SetPositionX(axes.x());
         SetPositionY(axes.y());
         SetPositionZ(axes.z());
     }
-    else if (attributeName == L"center" && vector)
+    else if (attributeName == L"center"sv && vector)
     {
         const osg::Vec3f axes = ToModelAxes(*vector);
         SetCenterX(axes.x());
         SetCenterY(axes.y());
         SetCenterZ(axes.z());
     }
-    else if (attributeName == L"rotation" && vector)
+    else if (attributeName == L"rotation"sv && vector)
     {
         const osg::Vec3f axes = ToModelAxes(*vector);
         SetRotationX(axes.x());
         SetRotationY(axes.y());
         SetRotationZ(axes.z());
     }
-    else if (attributeName == L"scale" && vector)
+    else if (attributeName == L"scale"sv && vector)
     {
         const osg::Vec3f percent = ToModelScale(*vector);
         SetScaleX(percent.x());
         SetScaleY(percent.y());
         SetScaleZ(percent.z());
     }
-    else if (attributeName == L"scale_orient" && vector)
+    else if (attributeName == L"scale_orient"sv && vector)
         SetScaleOrientation(ToModelAxes(*vector));
-    else if (attributeName == L"render_mode" && integer)
+    else if (attributeName == L"render_mode"sv && integer)
     {
         SetRenderMode(static_cast<VtERenderMode>(*integer));
         if (dye->enabled != 0)
@@ -61,13 +63,13 @@ void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std
             ApplyTransparency(GetRenderMode());
         }
     }
-    else if (attributeName == L"dye_enabled" && integer)
+    else if (attributeName == L"dye_enabled"sv && integer)
     {
         dye->enabled = *integer > 0 ? 1 : 0;
         RefreshAppearance();
         SetModified();
     }
-    else if (const auto* colour = std::get_if<VtTIntTupel3>(&value); colour && attributeName == L"dye_color")
+    else if (const auto* colour = std::get_if<VtTIntTupel3>(&value); colour && attributeName == L"dye_color"sv)
     {
         StoreDyeColour(*colour);
         if (dye->enabled != 0)
