@@ -6,6 +6,7 @@
 #include <QAction>
 #include <QApplication>
 #include <QDockWidget>
+#include <QLineEdit>
 #include <QLocalServer>
 #include <QLocalSocket>
 #include <QMenu>
@@ -174,6 +175,7 @@ Json DescribeDialogs()
             continue;
         Json one = {{"title", dialog->windowTitle().toStdString()},
                     {"rectangle", OnScreen(*dialog, dialog->rect())},
+                    {"has_keyboard", dialog->isActiveWindow()},
                     {"text", ""},
                     {"icon", 0}};
         if (const auto* box = qobject_cast<const QMessageBox*>(dialog))
@@ -186,6 +188,11 @@ Json DescribeDialogs()
             if (button->isVisible() && !button->text().isEmpty())
                 buttons[button->text().remove('&').toStdString()] = OnScreen(*button, button->rect());
         one["buttons"] = buttons;
+        Json fields = Json::array();
+        for (const auto* field : dialog->findChildren<QLineEdit*>())
+            if (field->isVisible())
+                fields.push_back(field->text().toStdString());
+        one["fields"] = fields;
         described.push_back(one);
     }
     return described;
@@ -294,6 +301,9 @@ std::string TestHook::Describe() const
     }
     if (const osgViewer::CompositeViewer* viewer = getViewer())
         state["drawn_frames"] = viewer->getFrameStamp() ? viewer->getFrameStamp()->getFrameNumber() : 0U;
+    state["contexts"] = osg::GraphicsContext::getAllRegisteredGraphicsContexts().size();
+    if (const auto* speed = window.findChild<QWidget*>("speed"); speed && speed->isVisible())
+        state["speed_control"] = OnScreen(*speed, speed->rect());
     state["actions"] = DescribeActions(window);
     state["menu_bar"] = DescribeBar(window);
     state["menus"] = DescribeMenus(window);

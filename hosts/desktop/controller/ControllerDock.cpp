@@ -218,6 +218,7 @@ QWidget* ControllerDock::MakePlayRow()
                 dialog->OnSpeedChange(steps);
         },
         VtCSimulationDataControllerDialog::lastSpeedPosition, widget);
+    speed->setObjectName(QStringLiteral("speed"));
     Explain(speed, speedControl);
     row->addWidget(speed);
     return widget;
