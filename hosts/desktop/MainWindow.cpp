@@ -37,6 +37,8 @@ namespace desktop
 namespace
 {
 
+constexpr QSize firstSize(1280, 840);
+constexpr QSize frameRoom(16, 48); // what a window manager may put around a window
 constexpr int refreshInterval = 100; // milliseconds between two looks at the states of commands
 constexpr int storeDelay = 1000;     // milliseconds that a window rests before its place is kept
 
@@ -82,7 +84,7 @@ MainWindow::MainWindow(DesktopHost& desktopHost, VtCPanoramicApp& application)
     auto* layout = new QVBoxLayout(middle);
     layout->setContentsMargins(0, 0, 0, 0);
     setCentralWidget(middle);
-    resize(1280, 840);
+    resize(firstSize.boundedTo(screen()->availableSize() - frameRoom));
 
     host.SetWindow(this, &sceneWindows);
     host.GetMessages().SetWindow(this);
@@ -211,6 +213,7 @@ void MainWindow::BuildToolBars()
     viewMenu->addSeparator();
     for (QToolBar* bar : {file, views, simulation})
         viewMenu->addAction(bar->toggleViewAction());
+    viewMenu->addSeparator();
     for (QDockWidget* dock : findChildren<QDockWidget*>())
         viewMenu->addAction(dock->toggleViewAction());
 }

@@ -2,6 +2,7 @@
 
 #include <memory>
 
+#include <osg/GLObjects>
 #include <QOffscreenSurface>
 #include <QOpenGLContext>
 
@@ -11,6 +12,20 @@
 
 namespace desktop
 {
+
+namespace
+{
+
+/// What scenes that are closed have left with the driver, since nothing has been drawn after them.
+void FreeDeletedObjects(osg::GraphicsContext& root)
+{
+    if (!root.makeCurrent())
+        return;
+    osg::flushAllDeletedGLObjects(root.getState()->getContextID());
+    root.releaseContext();
+}
+
+} // namespace
 
 QSurfaceFormat PaneGraphics::Format(int samples)
 {
@@ -30,39 +45,54 @@ QSurfaceFormat PaneGraphics::Format(int samples)
     return format;
 }
 
+PaneGraphics::PaneGraphics() = default;
+
+PaneGraphics::~PaneGraphics() = default;
+
 osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateContext(osg::GraphicsContext::Traits& traits,
                                                                host::Window& window)
 {
     auto* pane = dynamic_cast<ViewPane*>(&window);
-    const QSurfaceFormat format = Format(static_cast<int>(traits.samples));
+    const osg::ref_ptr<osg::GraphicsContext> shared = traits.sharedContext.get();
+    if (!pane && !shared && root && root->valid() && root->getTraits()->samples == traits.samples)
+    {
+        FreeDeletedObjects(*root);
+        lastError.clear();
+        return root;
+    }
 
     auto context = std::make_unique<QOpenGLContext>();
-    context->setFormat(format);
-    const osg::ref_ptr<osg::GraphicsContext> shared = traits.sharedContext.get();
+    context->setFormat(Format(static_cast<int>(traits.samples)));
     if (shared)
     {
-        const auto* root = dynamic_cast<PaneContext*>(shared.get());
-        if (!root || !root->GetContext())
+        const auto* sharing = dynamic_cast<PaneContext*>(shared.get());
+        if (!sharing || !sharing->GetContext())
             return Fail("the root context is closed or another library's");
-        context->setShareContext(root->GetContext());
+        context->setShareContext(sharing->GetContext());
     }
     if (!context->create())
         return Fail("the driver gives no context of desktop OpenGL");
     if (shared && !context->shareContext())
         return Fail("the driver lets the contexts of two windows share nothing");
 
+    if (!pane)
+        return CreateRoot(traits, std::move(context));
     lastError.clear();
-    if (pane)
-    {
-        pane->SetFormat(context->format());
-        return new PaneContext(traits, std::move(context), *pane);
-    }
+    pane->SetFormat(context->format());
+    return new PaneContext(traits, std::move(context), *pane);
+}
+
+osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateRoot(osg::GraphicsContext::Traits& traits,
+                                                            std::unique_ptr<QOpenGLContext> context)
+{
     auto surface = std::make_unique<QOffscreenSurface>();
     surface->setFormat(context->format());
     surface->create();
     if (!surface->isValid())
         return Fail("the driver has no off-screen surface");
-    return new PaneContext(traits, std::move(context), std::move(surface));
+    lastError.clear();
+    root = new PaneContext(traits, std::move(context), std::move(surface));
+    return root;
 }
 
 osg::ref_ptr<osg::GraphicsContext> PaneGraphics::Fail(const char* reason)

@@ -1,5 +1,7 @@
 #include "hosts/desktop/SceneFiles.h"
 
+#include <malloc.h>
+
 #include <QMessageBox>
 
 #include "app/PanoramicApp.h"
@@ -162,6 +164,8 @@ void SceneFiles::CloseScene()
     while (host.GetDocumentManager()->GetActiveDocument())
         host.GetDocumentManager()->CloseActiveDocument();
     scenePath.clear();
+    // Models are read by several threads, and the allocator keeps what each of them has needed at most.
+    malloc_trim(0);
 }
 
 bool SceneFiles::LoadData(const std::wstring& path)

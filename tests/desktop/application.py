@@ -29,12 +29,12 @@ class Application:
     def __init__(self, program: Path, screen: Screen, home: Path, arguments: list[str]) -> None:
         self.screen = screen
         self._socket_path = tempfile.mktemp(prefix="panoramic-hook-")
-        environment = {**os.environ, "DISPLAY": screen.name, "PANORAMIC_TEST_HOOK": self._socket_path,
-                       "XDG_CONFIG_HOME": str(home / "config"), "XDG_CACHE_HOME": str(home / "cache"),
-                       "XDG_STATE_HOME": str(home / "state"), "XDG_DATA_HOME": str(home / "data"),
-                       "QT_QPA_PLATFORM": "xcb", "LC_ALL": "C.UTF-8"}
+        self.environment = {**os.environ, "DISPLAY": screen.name, "PANORAMIC_TEST_HOOK": self._socket_path,
+                            "XDG_CONFIG_HOME": str(home / "config"), "XDG_CACHE_HOME": str(home / "cache"),
+                            "XDG_STATE_HOME": str(home / "state"), "XDG_DATA_HOME": str(home / "data"),
+                            "QT_QPA_PLATFORM": "xcb", "LC_ALL": "C.UTF-8"}
         self._log = open(home / "desktop.log", "ab")
-        self.process = subprocess.Popen([str(program), *arguments], env=environment, stdout=self._log,
+        self.process = subprocess.Popen([str(program), *arguments], env=self.environment, stdout=self._log,
                                         stderr=self._log)
         self._hook: socket.socket | None = None
 

@@ -1,7 +1,5 @@
 // Scene files: loading and saving a scene, and how the time grows with the number of records.
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -16,6 +14,7 @@
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"
+#include "tests/support/TemporaryFolder.h"
 #include "tools/bench/ExampleModels.h"
 
 namespace fs = std::filesystem;
@@ -30,21 +29,6 @@ const ModelList modelFiles = {
     "Buildings/$House/House.dae",  "Roadside/$Cone/Cone.dae",      "Buildings/$Office/Office.dae",
     "Roadside/$Gantry/Gantry.dae", "Landscape/$Ground/Ground.dae", "Landscape/$Oak/Oak.dae",
     "Roadside/$Lamp/Lamp.dae",
-};
-
-/// A folder that goes with its benchmark.
-class Folder
-{
-public:
-    Folder() : path(fs::temp_directory_path() / ("panoramic_bench_scene." + std::to_string(getpid())))
-    {
-        fs::create_directories(path);
-    }
-    ~Folder() { fs::remove_all(path); }
-    Folder(const Folder&) = delete;
-    Folder& operator=(const Folder&) = delete;
-
-    const fs::path path;
 };
 
 bool IsMovable(int index)
@@ -69,6 +53,16 @@ void Build(VtISceneDocument& document, VtCScene3D& scene, const std::vector<std:
         body->GetAttributeObject()->Write(L"position", VtTFloatTupel3{number, -number, 0.5F});
         body->GetAttributeObject()->Write(L"rotation", VtTFloatTupel3{0, 0, 0.1F * number});
     }
+}
+
+/// The file of such a scene.
+void SaveBodies(VtISceneDocument& document, const std::vector<std::wstring>& models, int count,
+                const std::wstring& file)
+{
+    VtCScene3D scene(document);
+    Build(document, scene, models, count);
+    if (!scene.SaveScene(file))
+        throw std::runtime_error(base::Utf8(scene.GetFileError()));
 }
 
 void Check(const VtCScene3D& scene, std::size_t bodies, const fake::MessageHandler& messages)
@@ -96,15 +90,10 @@ void TimeLoad(benchmark::State& state, Document& document, const std::wstring& f
 
 void LoadScene(benchmark::State& state)
 {
-    const Folder folder;
+    const TemporaryFolder folder;
     const std::wstring file = base::InnerPath(folder.path / "scene.xml");
     ModelDocument document(modelFiles, true);
-    {
-        VtCScene3D scene(document);
-        Build(document, scene, document.models, bodyCount);
-        if (!scene.SaveScene(file))
-            throw std::runtime_error(base::Utf8(scene.GetFileError()));
-    }
+    SaveBodies(document, document.models, bodyCount, file);
     for (auto _ : state)
     {
         state.PauseTiming();
@@ -138,7 +127,7 @@ void BuildInMemory(benchmark::State& state)
 
 void SaveScene(benchmark::State& state)
 {
-    const Folder folder;
+    const TemporaryFolder folder;
     const std::wstring file = base::InnerPath(folder.path / "scene.xml");
     ModelDocument document(modelFiles, true);
     VtCScene3D scene(document);
@@ -151,18 +140,13 @@ void SaveScene(benchmark::State& state)
 /// The bytes of the saved scene, all there already, in one call and flushed to the disk.
 void WriteBytes(benchmark::State& state)
 {
-    const Folder folder;
+    const TemporaryFolder folder;
     const fs::path path = folder.path / "scene.xml";
-    std::string bytes;
     {
         ModelDocument document(modelFiles, true);
-        VtCScene3D scene(document);
-        Build(document, scene, document.models, bodyCount);
-        if (!scene.SaveScene(base::InnerPath(path)))
-            throw std::runtime_error(base::Utf8(scene.GetFileError()));
-        std::ifstream saved(path, std::ios::binary);
-        bytes.assign(std::istreambuf_iterator<char>(saved), {});
+        SaveBodies(document, document.models, bodyCount, base::InnerPath(path));
     }
+    const std::string bytes = TemporaryFolder::Read(path);
     for (auto _ : state)
     {
         const int file = open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0666);
@@ -176,19 +160,12 @@ void WriteBytes(benchmark::State& state)
 /// Bodies over one model that costs nothing, so that only the records count.
 void LoadRecords(benchmark::State& state, int count)
 {
-    const Folder folder;
-    const fs::path model = folder.path / "$Box" / "Box.dae";
-    fs::create_directories(model.parent_path());
-    std::ofstream(model) << "";
+    const TemporaryFolder folder;
+    const fs::path model = folder.Write("$Box/Box.dae", "");
     const std::wstring file = base::InnerPath(folder.path / "scene.xml");
     fake::SceneDocument document;
     document.paths.objects = base::InnerPath(folder.path);
-    {
-        VtCScene3D scene(document);
-        Build(document, scene, {base::InnerPath(model)}, count);
-        if (!scene.SaveScene(file))
-            throw std::runtime_error(base::Utf8(scene.GetFileError()));
-    }
+    SaveBodies(document, {base::InnerPath(model)}, count, file);
     for (auto _ : state)
     {
         state.PauseTiming();

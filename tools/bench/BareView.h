@@ -1,0 +1,23 @@
+#pragma once
+
+#include <osg/ref_ptr>
+
+class VtCPanoramicView;
+namespace osg
+{
+class GraphicsContext;
+class Node;
+} // namespace osg
+namespace osgViewer
+{
+class View;
+}
+
+namespace bench
+{
+
+/// The library's own view of `scene` in `context`, with the camera and the light that `pane` has now: what a baseline
+/// draws.
+osg::ref_ptr<osgViewer::View> MakeBareView(VtCPanoramicView& pane, osg::Node* scene, osg::GraphicsContext* context);
+
+} // namespace bench
