@@ -77,6 +77,13 @@ std::optional<std::size_t> VtCSimulationDataFrames::FindAtTime(double t) const
     }
     if (t >= last)
         return count - 1;
+    return grid.IsEven() ? grid.Find(t) - (grid.GetCount() - count) : Search(t);
+}
+
+std::size_t VtCSimulationDataFrames::Search(double t) const
+{
+    const double first = GetTimeAt(0);
+    const double last = GetTimeAt(count - 1);
 
     // From here on times[low] <= t < times[high]. Stamps are mostly even, so the guess is right or next to it; where
     // they aren't, doubling steps from the guess bracket the frame and halving ends the search: 2 log2(n) looks.
@@ -142,6 +149,7 @@ VtCFrameRecord VtCSimulationDataFrames::Append(double time)
     std::memset(record, 0, stride);
     std::memcpy(record, &time, sizeof time);
     times[at] = time;
+    grid.Add(time);
     return {record, *description};
 }
 
@@ -158,6 +166,7 @@ std::unique_ptr<VtCSimulationDataFrames> VtCSimulationDataFrames::Copy(std::size
         copy->count += run;
         index += run;
     }
+    copy->grid = grid;
     return copy;
 }
 
@@ -165,11 +174,14 @@ VtCSimulationDataFrame* VtCSimulationDataFrames::HandOut(std::size_t index)
 {
     const std::size_t at = Physical(index);
     const std::byte* record = records.Data() + at * stride;
+    const double time = grid.IsEven()
+                            ? VtCSimulationDataFrame::RoundTimeStamp(grid.StampAt(grid.GetCount() - count + index))
+                            : times[at];
     VtCSimulationDataFrame& last = *views[lastView];
-    if (last.record == record && last.number == index + 1 && last.time == times[at])
+    if (last.record == record && last.number == index + 1 && last.time == time)
         return &last;
     lastView = (lastView + 1) % viewCount;
-    views[lastView]->Bind(record, times[at], index + 1);
+    views[lastView]->Bind(record, time, index + 1);
     return views[lastView].get();
 }
 

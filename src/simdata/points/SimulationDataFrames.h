@@ -9,6 +9,7 @@
 #include "simdata/points/ChannelDescription.h"
 #include "simdata/points/FrameBlock.h"
 #include "simdata/points/SimulationDataFrame.h"
+#include "simdata/points/TimeGrid.h"
 
 namespace SimulationDataPoints
 {
@@ -65,7 +66,7 @@ public:
 
     /// The last frame whose time stamp is not above `t`. Null before the first frame, beyond the last time stamp and
     /// in a buffer without time stamps. A repeating buffer takes a time beyond its end back by whole spans of the
-    /// buffer. A guess and a bounded search: never a walk.
+    /// buffer. A sum where the times are even, otherwise a guess and a bounded search: never a walk.
     VtCSimulationDataFrame* GetAtTime(double t, int reserved);
 
     /// Time stamp of the last frame; 0.0 in an empty buffer and one without time stamps.
@@ -102,7 +103,11 @@ public:
     /// For a loader that fills records in place: the free records of a buffer that has never been full, and taking
     /// the next one of them as a frame. `time` must be rounded and not below the last.
     std::byte* FreeRecords() { return records.Data() + count * stride; }
-    void TakeRecord(double time) { times[count++] = time; }
+    void TakeRecord(double time)
+    {
+        times[count++] = time;
+        grid.Add(time);
+    }
 
 private:
     std::size_t Physical(std::size_t index) const
@@ -111,6 +116,7 @@ private:
         return at < capacity ? at : at - capacity;
     }
     VtCSimulationDataFrame* HandOut(std::size_t index);
+    std::size_t Search(double t) const;
 
     std::shared_ptr<const VtTChannelDescription> description;
     std::size_t capacity;
@@ -118,6 +124,7 @@ private:
     std::size_t count = 0;
     std::size_t oldest = 0;
     bool repeating = false;
+    VtCTimeGrid grid; ///< of all frames, with those that were overwritten
     VtCFrameBlock records;
     VtCFrameBlock timeBlock;
     double* times;

@@ -49,23 +49,33 @@ TEST(Frames, ATimeFindsTheLastFrameNotAboveIt)
         SCOPED_TRACE(c.name);
         const auto frames = FramesAt(c.times);
         EXPECT_EQ(frames->PrepareForTimeSyncReplay(c.repeat, 0), c.times.empty() ? 0 : 1);
-        EXPECT_EQ(NumberIn(frames->GetAtTime(c.t, 0)), c.number);
+        VtCSimulationDataFrame* frame = frames->GetAtTime(c.t, 0);
+        EXPECT_EQ(NumberIn(frame), c.number);
+        if (frame)
+        {
+            EXPECT_EQ(frame->GetTimestamp(), c.times[static_cast<std::size_t>(c.number - 1)]);
+        }
     }
 }
 
-TEST(Frames, TheSearchAgreesWithAWalkOverUnevenTimes)
+TEST(Frames, TheSearchAgreesWithAWalkOverEvenAndUnevenTimes)
 {
     std::mt19937 random(7);
-    std::vector<double> even;
+    std::vector<double> even, sixty, late, days, off, nearly;
     std::vector<double> bursts = {0.0};
     std::vector<double> squares;
     for (int i = 0; i < 700; ++i)
     {
         even.push_back(0.01 * i);
+        sixty.push_back(i / 60.0);
+        late.push_back(1.7e9 + i / 120.0);
+        days.push_back(86400.0 * i / 7);
+        off.push_back(0.01 * i + (i == 650 ? 0.003 : 0.0));
+        nearly.push_back(0.001 * i + 1e-6 * (random() % 2));
         bursts.push_back(bursts.back() + (random() % 50 == 0 ? 100.0 : random() % 3 * 1e-6));
         squares.push_back(1e-3 * i * i * i);
     }
-    for (const auto& times : {even, bursts, squares})
+    for (const auto& times : {even, sixty, late, days, off, nearly, bursts, squares})
     {
         // A full ring too: the oldest 300 are overwritten.
         for (const std::size_t capacity : {times.size(), times.size() - 300})
@@ -82,7 +92,13 @@ TEST(Frames, TheSearchAgreesWithAWalkOverUnevenTimes)
                         expected = static_cast<int>(k) + 1;
                 if (std::llrint(t * 1e6) > std::llrint(times.back() * 1e6))
                     expected = 0;
-                ASSERT_EQ(NumberIn(frames->GetAtTime(t, 0)), expected) << "t " << t << " capacity " << capacity;
+                VtCSimulationDataFrame* frame = frames->GetAtTime(t, 0);
+                ASSERT_EQ(NumberIn(frame), expected) << "t " << t << " capacity " << capacity;
+                if (frame)
+                {
+                    const double stored = times[static_cast<std::size_t>(expected - 1)];
+                    ASSERT_EQ(frame->GetTimestamp(), VtCSimulationDataFrame::RoundTimeStamp(stored));
+                }
             }
         }
     }
