@@ -274,6 +274,7 @@ std::string TestHook::Describe() const
                   {"title", window.windowTitle().remove("[*]").toStdString()},
                   {"window", OnScreen(window, window.rect())},
                   {"minimised", window.isMinimized()},
+                  {"has_keyboard", window.isActiveWindow()},
                   {"fps", base::Utf8(host.GetDesktopVariables().GetText(L"fps"))},
                   {"source", base::Utf8(host.GetDesktopVariables().GetText(L"simulationDatapointInfo"))},
                   {"selected", base::Utf8(window.GetSelectedName())},

@@ -79,7 +79,7 @@ class WindowTest(unittest.TestCase):
 
     def answer(self, box: State, button: str) -> None:
         self.screen.click(*middle(box["buttons"][button]))
-        self.application.wait(lambda s: not s["dialogs"], "the box has gone")
+        self.application.wait(lambda s: not s["dialogs"] and s["has_keyboard"], "the box has gone")
 
     # Opening
 
