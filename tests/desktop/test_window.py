@@ -313,7 +313,10 @@ class WindowTest(unittest.TestCase):
     def test_a_killed_program_finds_its_settings_and_scene_whole(self) -> None:
         self.start_example("--play")
         self.application.click_action("38707")
-        self.application.wait(lambda s: s["layout"] == 1, "two columns")
+        state = self.application.wait(lambda s: s["layout"] == 1, "two columns")
+        x, y, width, _ = state["docks"]["log"]["rectangle"]
+        self.screen.click(x + width - 9, y + 9)  # its cross
+        self.application.wait(lambda s: not s["docks"]["log"]["visible"], "the log is closed")
         self.screen.resize(1111, 777)
         time.sleep(2)
         before = self.scene.read_bytes()
@@ -322,6 +325,8 @@ class WindowTest(unittest.TestCase):
         state = self.start(str(self.scene))
         self.assertEqual(state["dialogs"], [], "nothing is damaged")
         self.assertLess(abs(state["window"][2] - 1111), 20, "the window's size came back")
+        self.assertFalse(state["docks"]["log"]["visible"], "the log stayed closed")
+        self.assertTrue(state["docks"]["controllerDock"]["visible"])
 
 
 if __name__ == "__main__":
