@@ -38,7 +38,7 @@ namespace
 {
 
 constexpr QSize firstSize(1280, 840);
-constexpr QSize frameRoom(16, 48); // what a window manager may put around a window
+constexpr QSize frameRoom(16, 48);   // what a window manager may put around a window
 constexpr int refreshInterval = 100; // milliseconds between two looks at the states of commands
 constexpr int storeDelay = 1000;     // milliseconds that a window rests before its place is kept
 

@@ -60,6 +60,13 @@ std::size_t Decode(std::string_view s, char32_t& code)
 
 std::string Utf8(std::wstring_view text)
 {
+    // Most texts are ASCII.
+    std::uint32_t allBits = 0;
+    for (const wchar_t wide : text)
+        allBits |= static_cast<std::uint32_t>(wide);
+    if (allBits < 0x80)
+        return {text.begin(), text.end()};
+
     std::string out;
     out.reserve(text.size());
     for (wchar_t wide : text)

@@ -51,9 +51,9 @@ VtEAttributeType ReadAttributeType(const pugi::xml_node& node, const VtTAttribut
     const pugi::xml_attribute told = node.attribute("type");
     if (!told)
         return rules.assumedType;
-    const VtEAttributeType type = AttributeTypeFromName(std::string_view(told.value()));
+    const VtEAttributeType type = AttributeTypeFromName(told.value());
     if (rules.fixedType && *rules.fixedType != type)
-        throw VtCAttributeError("its type is " + base::Utf8(AttributeTypeName(*rules.fixedType)) + ", not " +
+        throw VtCAttributeError("its type is " + std::string(AttributeTypeName(*rules.fixedType)) + ", not " +
                                 told.value());
     return type;
 }
@@ -97,6 +97,8 @@ VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
 // A carriage return stays one only as a reference: readers of XML make a line end of it. So do line ends in quotes.
 bool NeedsReference(char c, bool inQuotes)
 {
+    if (c > '>')
+        return false;
     if (static_cast<unsigned char>(c) < 0x20)
         return inQuotes || (c != '\t' && c != '\n');
     return c == '&' || c == '<' || c == '>' || (c == '"' && inQuotes);
@@ -139,10 +141,10 @@ void AppendEscaped(std::string& text, std::string_view value, bool inQuotes)
     }
 }
 
-void AppendValue(std::string& text, std::string_view value)
+void AppendTextValue(std::string& text, const std::wstring& value)
 {
     text += "<vtattr:value>";
-    AppendEscaped(text, value, false);
+    AppendEscaped(text, base::Utf8(value), false);
     text += "</vtattr:value>";
 }
 
@@ -247,25 +249,40 @@ osg::ref_ptr<VtISceneObject> VtCObjectReader::Read(const pugi::xml_node& element
     return object;
 }
 
-void WriteObjectElement(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace)
+void VtCObjectWriter::Write(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace)
 {
     text.append(indent, ' ') += "<vtattr:Object";
     if (declaresNamespace)
         (text += " xmlns:vtattr=\"") += attributesNamespace + std::string("\"");
     text += " type=\"" + std::to_string(object.GetObjectType()) + "\">\n";
+    StartTags& tags = startTags[object.GetObjectType()];
+    tags.resize(std::max(tags.size(), object.GetAttributes().size()));
+    auto tag = tags.begin();
     for (const osg::ref_ptr<VtISceneAttribute>& attribute : object.GetAttributes())
     {
-        text.append(indent + 2, ' ') += "<vtattr:Attribute name=\"";
-        AppendEscaped(text, base::Utf8(attribute->GetName()), true);
-        text.append("\" type=\"").append(base::Utf8(AttributeTypeName(attribute->GetType()))) += "\">";
-        if (const auto* texts = std::get_if<std::vector<std::wstring>>(&attribute->GetValue()))
-            for (const std::wstring& value : *texts)
-                AppendValue(text, base::Utf8(value));
+        text.append(indent + 2, ' ') += StartTag(*tag++, *attribute);
+        const VtTAttributeValue& value = attribute->GetValue();
+        if (const auto* texts = std::get_if<std::vector<std::wstring>>(&value))
+            for (const std::wstring& entry : *texts)
+                AppendTextValue(text, entry);
+        else if (const auto* one = std::get_if<std::wstring>(&value))
+            AppendTextValue(text, *one);
         else
-            AppendValue(text, AttributeValueToUtf8(attribute->GetValue()));
+            text.append("<vtattr:value>").append(AttributeValueToUtf8(value)) += "</vtattr:value>";
         text += "</vtattr:Attribute>\n";
     }
     text.append(indent, ' ') += "</vtattr:Object>\n";
+}
+
+const std::string& VtCObjectWriter::StartTag(VtTStartTag& tag, const VtISceneAttribute& attribute)
+{
+    if (tag.name != &attribute.GetName() || tag.type != attribute.GetType())
+    {
+        tag = {&attribute.GetName(), attribute.GetType(), "<vtattr:Attribute name=\""};
+        AppendEscaped(tag.text, base::Utf8(attribute.GetName()), true);
+        tag.text.append("\" type=\"").append(AttributeTypeName(attribute.GetType())) += "\">";
+    }
+    return tag.text;
 }
 
 std::ptrdiff_t LineOf(std::ptrdiff_t offset, std::string_view text)

@@ -1,10 +1,12 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <vector>
 
 #include <osg/ref_ptr>
 
@@ -68,8 +70,28 @@ private:
     std::unordered_map<std::string_view, VtTAttributeRules> rules; ///< keys lie in the document
 };
 
-/// Appends the element of `object`, indented by `indent` blanks, with the declaration of the namespace if asked for.
-void WriteObjectElement(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace);
+/// Writes records that live as long as this does. What attributes of one name have in common is made once.
+class VtCObjectWriter
+{
+public:
+    /// Appends the element of `object` to `text`, indented by `indent` blanks, with the declaration of the namespace if
+    /// asked for.
+    void Write(std::string& text, const VtISceneObject& object, std::size_t indent, bool declaresNamespace);
+
+private:
+    struct VtTStartTag
+    {
+        const std::wstring* name = nullptr; ///< shared by attributes
+        VtEAttributeType type = VtEAttributeType::integer;
+        std::string text;
+    };
+
+    using StartTags = std::vector<VtTStartTag>; ///< by place in a record
+
+    static const std::string& StartTag(VtTStartTag& tag, const VtISceneAttribute& attribute);
+
+    std::unordered_map<std::int32_t, StartTags> startTags; ///< records of one type have their attributes in one order
+};
 
 /// The line of a byte of `text`, counted from 1.
 std::ptrdiff_t LineOf(std::ptrdiff_t offset, std::string_view text);

@@ -66,6 +66,6 @@ VtTParsedObject ParseObjectText(const std::wstring& text)
 std::wstring WriteObjectText(const VtISceneObject& object)
 {
     std::string text;
-    WriteObjectElement(text, object, 0, true);
+    VtCObjectWriter().Write(text, object, 0, true);
     return base::Wide(text);
 }

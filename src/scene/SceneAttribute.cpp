@@ -14,8 +14,8 @@
 namespace
 {
 
-constexpr std::wstring_view typeNames[] = {L"int",       L"float",     L"string",    L"floatTupel3",
-                                           L"intTupel3", L"floatList", L"stringList"};
+constexpr std::string_view typeNames[] = {"int",       "float",     "string",    "floatTupel3",
+                                          "intTupel3", "floatList", "stringList"};
 
 [[noreturn]] void Refuse(const std::string& reason)
 {
@@ -141,21 +141,15 @@ void CheckFinite(const std::wstring& name, const VtTAttributeValue& value)
 
 } // namespace
 
-std::wstring_view AttributeTypeName(VtEAttributeType type)
+std::string_view AttributeTypeName(VtEAttributeType type)
 {
     return typeNames[static_cast<std::size_t>(type)];
-}
-
-VtEAttributeType AttributeTypeFromName(std::wstring_view typeName)
-{
-    return AttributeTypeFromName(base::Utf8(typeName));
 }
 
 VtEAttributeType AttributeTypeFromName(std::string_view typeName)
 {
     for (std::size_t i = 0; i < std::size(typeNames); ++i)
-        if (std::equal(typeNames[i].begin(), typeNames[i].end(), typeName.begin(), typeName.end(),
-                       [](wchar_t wide, char narrow) { return wide == static_cast<wchar_t>(narrow); }))
+        if (typeNames[i] == typeName)
             return static_cast<VtEAttributeType>(i);
     Refuse(Quoted(typeName) + " is not a type of attributes");
 }
@@ -233,6 +227,11 @@ VtISceneAttribute::VtISceneAttribute(VtTAttributeName attributeName, VtTAttribut
     CheckFinite(*name, value);
 }
 
+std::wstring VtISceneAttribute::GetTypeName() const
+{
+    return base::Wide(AttributeTypeName(GetType()));
+}
+
 void VtISceneAttribute::SetValue(VtTAttributeValue newValue)
 {
     if (value.index() != newValue.index())
@@ -240,7 +239,7 @@ void VtISceneAttribute::SetValue(VtTAttributeValue newValue)
         const std::int32_t* integer = std::get_if<std::int32_t>(&newValue);
         if (!integer || GetType() != VtEAttributeType::real)
             Refuse("attribute " + Quoted(base::Utf8(*name)) + " is of type " + base::Utf8(GetTypeName()) +
-                   " and takes no " + base::Utf8(typeNames[newValue.index()]));
+                   " and takes no " + std::string(typeNames[newValue.index()]));
         newValue = static_cast<float>(*integer);
     }
     CheckFinite(*name, newValue);

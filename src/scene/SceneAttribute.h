@@ -40,10 +40,9 @@ public:
     using std::runtime_error::runtime_error;
 };
 
-/// The name of `type` in records, and back; an unknown name throws `VtCAttributeError`.
-std::wstring_view AttributeTypeName(VtEAttributeType type);
-VtEAttributeType AttributeTypeFromName(std::wstring_view typeName);
-VtEAttributeType AttributeTypeFromName(std::string_view typeName); // in UTF-8
+/// The name of `type` in records, in UTF-8, and back; an unknown name throws `VtCAttributeError`.
+std::string_view AttributeTypeName(VtEAttributeType type);
+VtEAttributeType AttributeTypeFromName(std::string_view typeName);
 
 /// The value that `text` stands for. Numbers are decimal with a point, those of a tuple or list separated by blanks;
 /// a list of texts has one entry a line. Throws `VtCAttributeError` when `text` isn't such a value.
@@ -70,7 +69,7 @@ public:
 
     const std::wstring& GetName() const { return *name; }
     VtEAttributeType GetType() const { return static_cast<VtEAttributeType>(value.index()); }
-    std::wstring GetTypeName() const { return std::wstring(AttributeTypeName(GetType())); }
+    std::wstring GetTypeName() const;
     const VtTAttributeValue& GetValue() const { return value; }
     std::wstring GetValueText() const { return AttributeValueToText(value); }
 

@@ -317,7 +317,8 @@ std::string WriteSceneText(const std::vector<osg::ref_ptr<VtISceneObject>>& obje
     text = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<vtattr:Scene xmlns:vtattr=\"";
     text += attributesNamespace;
     text.append("\" version=\"").append(sceneVersion) += "\">\n";
+    VtCObjectWriter writer;
     for (const osg::ref_ptr<VtISceneObject>& object : objects)
-        WriteObjectElement(text, *object, 2, false);
+        writer.Write(text, *object, 2, false);
     return text += "</vtattr:Scene>\n";
 }

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <utility>
 
+#include "base/Text.h"
+
 namespace
 {
 
@@ -53,7 +55,7 @@ void VtISceneObject::Index()
 
 void VtISceneObject::AddAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name)
 {
-    AddAttribute(name, AttributeValueFromText(AttributeTypeFromName(typeName), valueText));
+    AddAttribute(name, AttributeValueFromText(AttributeTypeFromName(base::Utf8(typeName)), valueText));
 }
 
 void VtISceneObject::AddAttribute(const std::wstring& name, VtTAttributeValue value)
