@@ -85,6 +85,7 @@ VtTAttributeValue ReadValue(const pugi::xml_node& node, VtEAttributeType type)
     if (type == VtEAttributeType::textList)
     {
         std::vector<std::wstring> texts;
+        texts.reserve(values.size());
         for (const std::string& value : values)
             texts.push_back(base::Wide(value));
         return texts;
