@@ -2,8 +2,10 @@
 
 find_program(PANORAMIC_CCACHE ccache)
 if(PANORAMIC_CCACHE)
-    # Precompiled headers are cached only when ccache may overlook their timestamps.
-    set(CMAKE_CXX_COMPILER_LAUNCHER "${CMAKE_COMMAND};-E;env;CCACHE_SLOPPINESS=pch_defines,time_macros;${PANORAMIC_CCACHE}")
+    # Precompiled headers are cached only when ccache may overlook their timestamps. What one clone of the tree has
+    # compiled serves another one in another folder.
+    set(CMAKE_CXX_COMPILER_LAUNCHER "${CMAKE_COMMAND};-E;env;CCACHE_SLOPPINESS=pch_defines,time_macros"
+        "CCACHE_BASEDIR=${CMAKE_SOURCE_DIR}" CCACHE_NOHASHDIR=1 "${PANORAMIC_CCACHE}")
 endif()
 find_program(PANORAMIC_MOLD mold)
 if(PANORAMIC_MOLD AND CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
@@ -31,11 +33,28 @@ function(panoramic_link_osg)
     target_link_libraries(panoramic_osg INTERFACE ${OPENSCENEGRAPH_LIBRARIES})
 endfunction()
 
-# panoramic_library(NAME SOURCES a.cpp ... LINKS lower ...): a static library that is seen from src/.
+# panoramic_headers(TARGET SCOPE PREFIX [FOLDER]): lets TARGET, and by SCOPE those that link it, write
+# #include "PREFIX/..." for the headers of FOLDER (this one unless told). Each target has an include folder of its own
+# with nothing but that prefix in it, so a header of a target that isn't linked is not found: the directions that
+# docs/architecture.md draws hold, or the build fails.
+function(panoramic_headers target scope prefix)
+    set(folder "${CMAKE_CURRENT_SOURCE_DIR}")
+    if(ARGC GREATER 3)
+        set(folder "${ARGV3}")
+    endif()
+    set(root "${CMAKE_BINARY_DIR}/headers/${target}")
+    get_filename_component(above "${root}/${prefix}" DIRECTORY)
+    file(MAKE_DIRECTORY "${above}")
+    file(CREATE_LINK "${folder}" "${root}/${prefix}" SYMBOLIC)
+    target_include_directories(${target} ${scope} "${root}")
+endfunction()
+
+# panoramic_library(NAME PREFIX scene SOURCES a.cpp ... LINKS lower ...): a static library whose headers are seen under
+# PREFIX by itself and by those that link it.
 function(panoramic_library name)
-    cmake_parse_arguments(arg "" "" "SOURCES;LINKS" ${ARGN})
+    cmake_parse_arguments(arg "" "PREFIX" "SOURCES;LINKS" ${ARGN})
     add_library(${name} STATIC ${arg_SOURCES})
-    target_include_directories(${name} PUBLIC "${CMAKE_SOURCE_DIR}/src")
+    panoramic_headers(${name} PUBLIC ${arg_PREFIX})
     target_link_libraries(${name} PUBLIC ${arg_LINKS})
 endfunction()
 
@@ -46,7 +65,6 @@ function(panoramic_test name)
         set(arg_TIMEOUT 300)
     endif()
     add_executable(${name} ${arg_SOURCES})
-    target_include_directories(${name} PRIVATE "${CMAKE_SOURCE_DIR}/src" "${CMAKE_SOURCE_DIR}")
     target_link_libraries(${name} PRIVATE ${arg_LINKS} GTest::gtest GTest::gmock GTest::gtest_main)
     # Beside the programs, so that what looks for plugins/ and Assets/ next to itself finds them.
     add_test(NAME ${name} COMMAND ${name})
@@ -57,7 +75,6 @@ endfunction()
 function(panoramic_plugin name)
     cmake_parse_arguments(arg "" "" "SOURCES;LINKS" ${ARGN})
     add_library(${name} MODULE ${arg_SOURCES})
-    target_include_directories(${name} PRIVATE "${CMAKE_SOURCE_DIR}/src")
     target_link_libraries(${name} PRIVATE ${arg_LINKS})
     set_target_properties(${name} PROPERTIES
         PREFIX ""

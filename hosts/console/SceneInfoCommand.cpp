@@ -13,8 +13,8 @@
 #include "hosts/console/ConsoleHost.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "interaction/FollowMode.h"
-#include "scene/RecordTables.h"
-#include "scene/SceneObjectStore.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/StoredModel.h"
 
 namespace console

@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include "app/PanoramicDocument.h"
+#include "assets/AssetManager.h"
 #include "base/Numbers.h"
 #include "base/Paths.h"
 #include "base/Text.h"
@@ -12,7 +13,6 @@
 #include "hosts/common/MotionDataFile.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/Session.h"
-#include "render/AssetManager.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"

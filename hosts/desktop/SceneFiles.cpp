@@ -13,7 +13,7 @@
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/Wording.h"
-#include "scene/SceneObjectStore.h"
+#include "records/SceneObjectStore.h"
 #include "simdata/SimulationDataController.h"
 
 namespace desktop

@@ -5,8 +5,8 @@
 
 #include <osg/Matrixd>
 
-#include "render/models/ModelPackage.h"
-#include "render/models/ModelRequest.h"
+#include "assets/models/ModelPackage.h"
+#include "assets/models/ModelRequest.h"
 
 /// The reading of one model: what is asked, and the report as it grows. A model is refused by throwing
 /// `std::runtime_error` with a reason that makes sense behind the model's path.

@@ -6,7 +6,7 @@
 #include <osg/Notify>
 #include <osgDB/Registry>
 
-#include "render/models/MemoryStream.h"
+#include "assets/models/MemoryStream.h"
 
 namespace
 {

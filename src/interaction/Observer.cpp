@@ -7,15 +7,15 @@
 
 #include "base/Maths.h"
 #include "base/Numbers.h"
+#include "base/SettingsAccess.h"
 #include "base/Text.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/Observers.h"
-#include "interaction/SettingsAccess.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/EulerAngles.h"
 #include "scene/MovableBody.h"
-#include "scene/RecordTables.h"
 #include "scene/Scene3D.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 namespace

@@ -3,11 +3,11 @@
 #include <algorithm>
 
 #include "base/Numbers.h"
+#include "base/SettingsAccess.h"
 #include "base/Text.h"
 #include "host/Messages.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/Observer.h"
-#include "interaction/SettingsAccess.h"
 #include "scene/EulerAngles.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"

@@ -7,12 +7,12 @@
 #include "interaction/MouseInput.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
+#include "records/SceneObjectStore.h"
 #include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
 #include "scene/Body.h"
 #include "scene/Scene3D.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 namespace

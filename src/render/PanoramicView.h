@@ -6,8 +6,8 @@
 #include <osg/ref_ptr>
 
 #include "host/Graphics.h"
+#include "records/SceneObject.h"
 #include "render/Base3DView.h"
-#include "scene/SceneObject.h"
 
 namespace host
 {

@@ -5,11 +5,11 @@
 #include "base/Ids.h"
 #include "host/Messages.h"
 #include "host/ViewWindows.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "render/PanoramicView.h"
 #include "render/Viewer.h"
 #include "render/ViewFrame.h"
-#include "scene/RecordTables.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 namespace

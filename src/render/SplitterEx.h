@@ -8,7 +8,7 @@
 #include <osg/ref_ptr>
 
 #include "host/Graphics.h"
-#include "scene/SceneObject.h"
+#include "records/SceneObject.h"
 
 namespace host
 {

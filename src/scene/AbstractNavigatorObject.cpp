@@ -2,9 +2,9 @@
 
 #include "base/Ids.h"
 #include "base/Text.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/LibraryPath.h"
-#include "scene/RecordTables.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 #include <algorithm>

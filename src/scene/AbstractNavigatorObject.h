@@ -7,9 +7,9 @@
 
 #include <osg/ref_ptr>
 
+#include "records/SceneObject.h"
 #include "scene/AbstractObject.h"
 #include "scene/PGEventSink.h"
-#include "scene/SceneObject.h"
 
 class VtISceneDocument;
 struct VtTSceneServices;

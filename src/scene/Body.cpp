@@ -2,10 +2,10 @@
 
 #include "base/Text.h"
 #include "host/Messages.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/BoundingBox.h"
-#include "scene/RecordTables.h"
 #include "scene/Scene3D.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 #include "scene/UserData.h"
 

@@ -2,10 +2,10 @@
 
 #include "base/Maths.h"
 #include "base/Text.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/LibraryPath.h"
 #include "scene/MovableBodies.h"
-#include "scene/RecordTables.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 
 #include <algorithm>

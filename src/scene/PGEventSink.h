@@ -2,7 +2,7 @@
 
 #include <osg/ref_ptr>
 
-#include "scene/SceneObject.h"
+#include "records/SceneObject.h"
 
 class VtCGlidePanelAbstractNavigatorObject;
 

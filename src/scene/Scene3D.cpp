@@ -3,10 +3,10 @@
 #include "base/Text.h"
 #include "host/Messages.h"
 #include "host/Storage.h"
+#include "records/RecordTables.h"
+#include "records/SceneObjectStore.h"
 #include "scene/MovableBody.h"
-#include "scene/RecordTables.h"
 #include "scene/SceneLoader.h"
-#include "scene/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 #include "scene/ShaderCollector.h"
 

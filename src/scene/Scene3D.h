@@ -11,9 +11,9 @@
 #include <osg/Projection>
 #include <osg/ref_ptr>
 
+#include "records/SceneObject.h"
 #include "scene/MovableBodies.h"
 #include "scene/RenderMode.h"
-#include "scene/SceneObject.h"
 #include "scene/StaticBodies.h"
 
 class VtC3DMovableBody;

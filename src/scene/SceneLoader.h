@@ -7,7 +7,7 @@
 #include <osg/ref_ptr>
 
 #include "base/Text.h"
-#include "scene/SceneObject.h"
+#include "records/SceneObject.h"
 
 class VtC3DStaticBody;
 class VtCGlidePanelAbstractNavigatorObject;

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "scene/SceneObject.h"
+#include "records/SceneObject.h"
 
 class VtC3DMovableBody;
 class VtCGlidePanelAbstractNavigatorObject;

@@ -2,9 +2,9 @@
 
 #include "base/Text.h"
 #include "host/LibraryPaths.h"
+#include "records/RecordTables.h"
 #include "scene/EulerAngles.h"
 #include "scene/LibraryPath.h"
-#include "scene/RecordTables.h"
 #include "scene/RoadSurface.h"
 #include "scene/SceneServices.h"
 

@@ -1,4 +1,4 @@
-#include "tests/cli/CommandFixture.h"
+#include "CommandFixture.h"
 
 #include <filesystem>
 #include <map>

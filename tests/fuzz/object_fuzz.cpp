@@ -4,7 +4,7 @@
 #include <string_view>
 
 #include "base/Text.h"
-#include "scene/ObjectText.h"
+#include "records/ObjectText.h"
 
 namespace
 {

@@ -1,7 +1,7 @@
 // Any bytes as a scene file: they are refused with a line and nothing else, or what was read writes a text that reads
 // back as the same bytes.
 #include "FuzzFile.h"
-#include "scene/SceneFileText.h"
+#include "records/SceneFileText.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {

@@ -9,7 +9,7 @@
 #include <osg/ref_ptr>
 #include <osg/Vec4f>
 
-#include "scene/SceneObjectStore.h"
+#include "records/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 #include "tests/support/FakeHost.h"
 

@@ -3,8 +3,8 @@
 #include <stdexcept>
 #include <unistd.h>
 
+#include "assets/AssetManager.h"
 #include "base/Paths.h"
-#include "render/AssetManager.h"
 
 namespace fs = std::filesystem;
 

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "scene/SceneObjectStore.h"
+#include "records/SceneObjectStore.h"
 #include "scene/SceneServices.h"
 #include "tests/support/FakeScene.h"
 

@@ -6,8 +6,8 @@
 #include <osg/Version>
 #include <osgDB/Registry>
 
+#include "assets/AssetManager.h"
 #include "base/Paths.h"
-#include "render/AssetManager.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"

@@ -4,12 +4,12 @@
 #include "base/Text.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
+#include "records/SceneObjectStore.h"
 #include "render/ChildFrame.h"
 #include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
-#include "scene/SceneObjectStore.h"
 #include "tests/support/FakeViews.h"
 #include "tests/support/TemporaryFolder.h"
 

@@ -1,6 +1,6 @@
 #include "base/Text.h"
+#include "scene/tests/SceneFixture.h"
 #include "scene/UserData.h"
-#include "src/scene/tests/SceneFixture.h"
 
 namespace
 {

@@ -3,7 +3,7 @@
 #include <osg/PolygonMode>
 #include <osg/ShadeModel>
 
-#include "src/scene/tests/SceneFixture.h"
+#include "scene/tests/SceneFixture.h"
 
 namespace
 {

@@ -3,7 +3,7 @@
 #include <osg/ProxyNode>
 
 #include "scene/EulerAngles.h"
-#include "src/scene/tests/SceneFixture.h"
+#include "scene/tests/SceneFixture.h"
 
 namespace
 {

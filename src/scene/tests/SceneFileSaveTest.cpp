@@ -11,8 +11,8 @@
 #include <unistd.h>
 
 #include "base/AtomicFile.h"
-#include "scene/SceneFileText.h"
-#include "scene/tests/SceneFileFixture.h"
+#include "records/SceneFileText.h"
+#include "records/tests/SceneFileFixture.h"
 #include "scene/tests/SceneFixture.h"
 
 using namespace scenefile;

@@ -4,9 +4,9 @@
 #include <string>
 #include <vector>
 
-#include "scene/RecordTables.h"
+#include "records/RecordTables.h"
+#include "records/tests/SceneFileFixture.h"
 #include "scene/SceneParts.h"
-#include "scene/tests/SceneFileFixture.h"
 #include "scene/tests/SceneFixture.h"
 
 using namespace scenefile;

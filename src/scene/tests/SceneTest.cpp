@@ -1,7 +1,7 @@
 #include <osg/Program>
 
+#include "scene/tests/SceneFixture.h"
 #include "scene/UserData.h"
-#include "src/scene/tests/SceneFixture.h"
 
 namespace
 {

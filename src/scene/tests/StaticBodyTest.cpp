@@ -4,7 +4,7 @@
 #include <osg/Stencil>
 
 #include "scene/EulerAngles.h"
-#include "src/scene/tests/SceneFixture.h"
+#include "scene/tests/SceneFixture.h"
 
 namespace
 {

@@ -3,9 +3,9 @@
 #include <osg/ProxyNode>
 
 #include "base/Text.h"
+#include "records/ObjectText.h"
 #include "scene/MovableBodies.h"
 #include "scene/MovableBody.h"
-#include "scene/ObjectText.h"
 #include "scene/Scene3D.h"
 #include "simdata/ChannelLists.h"
 #include "simdata/tests/SimulationFixture.h"

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <string_view>
+
+#include <osg/ref_ptr>
+
+#include "records/SceneObject.h"
+
+/// Types of records, as their attribute `object_type` numbers them.
+enum VtEObjectType : std::int32_t
+{
+    objectTypeAtmospherics = 0,
+    objectTypeWindowLayout = 1,
+    objectTypeRenderSettings = 2,
+    objectTypeView = 3,
+    objectTypeInstrument = 4,
+    objectTypeObserver = 5,
+    objectTypeStaticBody = 6,
+    objectTypeMovableBody = 7,
+    objectTypeTrack = 8,
+    objectTypeDefaultObserver = 9, ///< "Free1" and "Free2"
+};
+
+/// The type that every record gives an attribute of that name; nothing for names that aren't fixed.
+std::optional<VtEAttributeType> FixedAttributeType(std::wstring_view name);
+
+/// The type of `name` when a text doesn't tell it: the fixed one, that of a part's attribute ("<id>_position"), or
+/// text.
+VtEAttributeType AssumedAttributeType(std::wstring_view name);
+
+/// How many numbers the list of that name holds in every record; nothing for lists of any length.
+std::optional<std::size_t> FixedListLength(std::wstring_view name);
+
+/// A new record with the values of a new object; null for a type without such a record.
+osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType);
