@@ -1,6 +1,5 @@
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <fstream>
 #include <string>
 
@@ -162,28 +161,6 @@ TEST(SceneFileText, TheSchemaTakesWhatIsWrittenAndRefusesTheRest)
     const VtTSceneRecords read = ParseSceneText(shown);
     EXPECT_EQ(read.error, "");
     EXPECT_TRUE(takes(WriteSceneText(read.objects)));
-}
-
-double SecondsToRead(int records)
-{
-    std::string text;
-    for (int i = 0; i < records; ++i)
-        text += Object(7, "id" + std::to_string(i), "Body", Attribute("position", "1 2 3", "floatTupel3"));
-    text = Scene(text);
-    double best = 1e9;
-    for (int run = 0; run < 3; ++run)
-    {
-        const auto begin = std::chrono::steady_clock::now();
-        EXPECT_EQ(ParseSceneText(text).objects.size(), static_cast<std::size_t>(records));
-        best = std::min(best, std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count());
-    }
-    return best;
-}
-
-TEST(SceneFileText, TenTimesTheRecordsTakeAboutTenTimesTheTime)
-{
-    const double thousand = SecondsToRead(1000);
-    EXPECT_LT(SecondsToRead(10000), thousand * 25); // 12 on a quiet machine
 }
 
 long PeakKilobytes()

@@ -1,6 +1,5 @@
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <string>
 #include <vector>
 
@@ -398,30 +397,6 @@ TEST_F(SceneLoader, ReloadingTakesBodiesFromOneFileAndTheRestFromAnother)
     EXPECT_EQ(document.questions.replacements[1].observers, std::vector<std::wstring>{L"eye o"});
     EXPECT_EQ(document.questions.replacements[1].candidates, std::vector<std::wstring>{L"name of car"});
     EXPECT_EQ(parts.made[0]->body, scene.GetMovableBodies(0)->GetBodies()[0]);
-}
-
-double SecondsToLoad(int bodies)
-{
-    const Folder folder;
-    std::string text;
-    for (int i = 0; i < bodies; ++i)
-        text +=
-            Body(i % 2 ? 7 : 6, "id" + std::to_string(i), Attribute("parent_object_id", "id" + std::to_string(i / 8)));
-    fake::SceneDocument document;
-    VtCScene3D scene(document);
-    const std::wstring path =
-        folder.Write("scene.xml", Scene(text.replace(text.find(">id0<", text.find("parent")), 5, "><")));
-    const auto begin = std::chrono::steady_clock::now();
-    EXPECT_TRUE(scene.LoadSceneFile(path, false)) << base::Utf8(scene.GetFileError());
-    return std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count();
-}
-
-TEST(SceneLoaderSpeed, TenTimesTheBodiesTakeAboutTenTimesTheTime)
-{
-    const double thousand = std::min(SecondsToLoad(1000), SecondsToLoad(1000));
-    const double tenThousand = SecondsToLoad(10000);
-    RecordProperty("ratio", std::to_string(tenThousand / thousand));
-    EXPECT_LT(tenThousand, thousand * 25); // 12 on a quiet machine
 }
 
 } // namespace
