@@ -9,7 +9,7 @@
 #include "base/Text.h"
 #include "hosts/common/EglContext.h"
 #include "hosts/common/EglDisplay.h"
-#include "hosts/common/OffscreenWindow.h"
+#include "hosts/common/OffscreenViews.h"
 
 namespace hosts
 {
@@ -81,9 +81,10 @@ std::string SizeText(int width, int height)
 
 } // namespace
 
-osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsContext::Traits& traits,
-                                                              host::Window& window)
+osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(const host::ContextRequest& request)
 {
+    osg::GraphicsContext::Traits& traits = request.traits;
+    const bool root = request.kind == host::WindowKind::root;
     std::string error;
     const EglDisplay* display = EglDisplay::Open(error);
     if (!display)
@@ -93,6 +94,8 @@ osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsConte
     EGLContext sharedContext = EGL_NO_CONTEXT;
     if (const osg::ref_ptr<osg::GraphicsContext> shared = traits.sharedContext.get())
     {
+        if (root)
+            return Fail("a root context shares with nobody");
         const auto* ours = dynamic_cast<EglContext*>(shared.get());
         if (!ours || !ours->valid())
             return Fail("the root context is closed or another library's");
@@ -105,8 +108,7 @@ osg::ref_ptr<osg::GraphicsContext> EglGraphics::CreateContext(osg::GraphicsConte
         return Fail("the driver (" + display->GetName() + ") has no off-screen surface with the colours, depth and " +
                     "stencil that are needed");
 
-    // The root context, which shares with nobody, is never drawn to.
-    const auto* surfaceOwner = sharedContext == EGL_NO_CONTEXT ? nullptr : dynamic_cast<OffscreenSurface*>(&window);
+    const auto* surfaceOwner = root ? nullptr : dynamic_cast<OffscreenSurface*>(&request.window);
     const host::Rectangle largest = surfaceOwner ? surfaceOwner->GetSurfaceRectangle() : host::Rectangle();
     const int width = std::max({1, traits.width, largest.width});
     const int height = std::max({1, traits.height, largest.height});

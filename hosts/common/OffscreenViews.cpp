@@ -73,4 +73,19 @@ std::unique_ptr<host::ChildFrameWindow> OffscreenViews::MakeChildFrame()
     return std::make_unique<Frame>(*this);
 }
 
+host::OpenedWindow OffscreenViews::OpenWindow(const host::WindowRequest& request)
+{
+    switch (request.kind)
+    {
+    case host::WindowKind::fullscreen:
+        if (request.screen == 0)
+            return {std::make_unique<OffscreenWindow>(width, height, request.kind), {}};
+        return {nullptr, L"a program without a display has one screen, number 0"};
+    case host::WindowKind::editorView:
+        return {std::make_unique<OffscreenWindow>(request.width, request.height, request.kind), {}};
+    default:
+        return {nullptr, L"panes come with the window of their scene"};
+    }
+}
+
 } // namespace hosts

@@ -9,7 +9,6 @@
 #include <vector>
 
 #include "host/ViewWindows.h"
-#include "hosts/common/OffscreenWindow.h"
 
 namespace host
 {
@@ -18,6 +17,34 @@ class Clock;
 
 namespace hosts
 {
+
+/// A window whose surface is larger than what is drawn to at present.
+class OffscreenSurface
+{
+public:
+    virtual ~OffscreenSurface() = default;
+    virtual host::Rectangle GetSurfaceRectangle() const = 0;
+};
+
+/// A window that nobody sees: just a size. What is drawn to it is read back from its context.
+class OffscreenWindow : public host::ViewWindow
+{
+public:
+    OffscreenWindow(int width, int height, host::WindowKind windowKind = host::WindowKind::pane)
+        : kind(windowKind), rectangle{0, 0, width, height}
+    {
+    }
+
+    host::WindowKind GetKind() const override { return kind; }
+    host::Rectangle GetClientRectangle() const override { return rectangle; }
+
+    /// A context keeps the size it was made with; a resized window needs a new one.
+    void Resize(int width, int height) { rectangle = {0, 0, width, height}; }
+
+private:
+    host::WindowKind kind;
+    host::Rectangle rectangle;
+};
 
 /// A pane that nobody sees. Its surface is as large as the whole frame, so that it can grow without a new context.
 class OffscreenPane : public host::PaneWindow, public OffscreenSurface
@@ -71,6 +98,9 @@ public:
     void RunTimers();
 
     std::unique_ptr<host::ChildFrameWindow> MakeChildFrame() override;
+
+    /// A surface like any other: as large as the frames for a whole screen, as large as the tool says for its view.
+    host::OpenedWindow OpenWindow(const host::WindowRequest& request) override;
 
     /// There is no selection to be shown.
     void SelectObject(const std::wstring&) override {}

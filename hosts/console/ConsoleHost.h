@@ -30,6 +30,8 @@ class ConsoleWindow : public host::MainWindow
 public:
     std::int32_t GetWindowState() const override { return state; }
     void SetWindowState(std::int32_t newState) override { state = newState; }
+    void Hide() override {} // nobody sees it either way
+    void ShowMaximised() override {}
 
 private:
     std::int32_t state = host::windowNormal;

@@ -99,7 +99,7 @@ bool ConsoleView::Arrange(ConsoleHost& host, const ViewArguments& arguments)
         frame.ApplyLayout(*arguments.layout);
     else if (arguments.ShowsOnePane())
         frame.ApplyLayout(layoutSingle);
-    if (!arguments.observer.empty() && !frame.GetActiveView()->assignObserverByName(base::Wide(arguments.observer)))
+    if (!arguments.observer.empty() && !frame.GetActivePane()->assignObserverByName(base::Wide(arguments.observer)))
     {
         host.ShowError(messageNoObserver, arguments.observer, ObserverNames(document.GetObservers()));
         return false;
@@ -111,7 +111,7 @@ bool ConsoleView::Arrange(ConsoleHost& host, const ViewArguments& arguments)
 
 void ConsoleView::LookAt(const Place& place)
 {
-    VtCPanoramicView& view = *document.GetChildFrame()->GetActiveView();
+    VtCPanoramicView& view = *document.GetChildFrame()->GetActivePane();
     const VtC3DObserver* observer = document.GetObservers().GetFree1();
     if (view.getObserver() != observer)
         view.assignObserverByName(observer->GetName());

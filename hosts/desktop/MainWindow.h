@@ -51,6 +51,8 @@ public:
 
     std::int32_t GetWindowState() const override;
     void SetWindowState(std::int32_t state) override;
+    void Hide() override { hide(); }
+    void ShowMaximised() override { showMaximized(); }
     void AddMenuResource(std::uint32_t) override {} // the menus are the window's own
     void SetToolBarEvents(host::ToolBarEvents* events) override { toolBarEvents = events; }
     bool IsPaneShown(std::uint32_t pane) const override;

@@ -49,48 +49,67 @@ PaneGraphics::PaneGraphics() = default;
 
 PaneGraphics::~PaneGraphics() = default;
 
-osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateContext(osg::GraphicsContext::Traits& traits,
-                                                               host::Window& window)
+osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateContext(const host::ContextRequest& request)
 {
-    auto* pane = dynamic_cast<ViewPane*>(&window);
-    const osg::ref_ptr<osg::GraphicsContext> shared = traits.sharedContext.get();
-    if (!pane && !shared && root && root->valid() && root->getTraits()->samples == traits.samples)
-    {
-        FreeDeletedObjects(*root);
-        lastError.clear();
-        return root;
-    }
-
-    auto context = std::make_unique<QOpenGLContext>();
-    context->setFormat(Format(static_cast<int>(traits.samples)));
-    if (shared)
-    {
-        const auto* sharing = dynamic_cast<PaneContext*>(shared.get());
-        if (!sharing || !sharing->GetContext())
-            return Fail("the root context is closed or another library's");
-        context->setShareContext(sharing->GetContext());
-    }
-    if (!context->create())
-        return Fail("the driver gives no context of desktop OpenGL");
-    if (shared && !context->shareContext())
-        return Fail("the driver lets the contexts of two windows share nothing");
-
-    if (!pane)
-        return CreateRoot(traits, std::move(context));
     lastError.clear();
-    pane->SetFormat(context->format());
-    return new PaneContext(traits, std::move(context), *pane);
+    if (request.kind == host::WindowKind::root)
+        return CreateRoot(request.traits);
+    auto* pane = dynamic_cast<ViewPane*>(&request.window);
+    if (request.kind == host::WindowKind::pane && pane)
+        return CreateForPane(request.traits, *pane);
+    return Fail("this program draws to the panes of its window only");
 }
 
-osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateRoot(osg::GraphicsContext::Traits& traits,
-                                                            std::unique_ptr<QOpenGLContext> context)
+std::unique_ptr<QOpenGLContext> PaneGraphics::CreateDriverContext(const osg::GraphicsContext::Traits& traits)
 {
+    auto context = std::make_unique<QOpenGLContext>();
+    context->setFormat(Format(static_cast<int>(traits.samples)));
+    const osg::ref_ptr<osg::GraphicsContext> shared = traits.sharedContext.get();
+    const auto* sharing = dynamic_cast<PaneContext*>(shared.get());
+    if (shared && (!sharing || !sharing->GetContext()))
+    {
+        Fail("the root context is closed or another library's");
+        return nullptr;
+    }
+    if (shared)
+        context->setShareContext(sharing->GetContext());
+    if (!context->create())
+    {
+        Fail("the driver gives no context of desktop OpenGL");
+        return nullptr;
+    }
+    if (shared && !context->shareContext())
+    {
+        Fail("the driver lets the contexts of two windows share nothing");
+        return nullptr;
+    }
+    return context;
+}
+
+osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateForPane(osg::GraphicsContext::Traits& traits, ViewPane& pane)
+{
+    std::unique_ptr<QOpenGLContext> context = CreateDriverContext(traits);
+    if (!context)
+        return nullptr;
+    pane.SetFormat(context->format());
+    return new PaneContext(traits, std::move(context), pane);
+}
+
+osg::ref_ptr<osg::GraphicsContext> PaneGraphics::CreateRoot(osg::GraphicsContext::Traits& traits)
+{
+    if (root && root->valid() && root->getTraits()->samples == traits.samples)
+    {
+        FreeDeletedObjects(*root);
+        return root;
+    }
+    std::unique_ptr<QOpenGLContext> context = CreateDriverContext(traits);
+    if (!context)
+        return nullptr;
     auto surface = std::make_unique<QOffscreenSurface>();
     surface->setFormat(context->format());
     surface->create();
     if (!surface->isValid())
         return Fail("the driver has no off-screen surface");
-    lastError.clear();
     root = new PaneContext(traits, std::move(context), std::move(surface));
     return root;
 }

@@ -13,6 +13,7 @@ namespace desktop
 {
 
 class PaneContext;
+class ViewPane;
 
 /// Contexts that draw to the panes of a main window, by the windowing toolkit.
 ///
@@ -27,15 +28,15 @@ public:
     /// What surface a context with that many samples a pixel draws to.
     static QSurfaceFormat Format(int samples);
 
-    /// A pane's window takes the format of its context, so it may be made anew here. Any other window stands for the
-    /// root context.
-    osg::ref_ptr<osg::GraphicsContext> CreateContext(osg::GraphicsContext::Traits& traits,
-                                                     host::Window& window) override;
+    /// A pane's window takes the format of its context, so it may be made anew here. Windows of editors and over whole
+    /// screens are refused: this program opens none.
+    osg::ref_ptr<osg::GraphicsContext> CreateContext(const host::ContextRequest& request) override;
     std::wstring GetLastError() const override { return lastError; }
 
 private:
-    osg::ref_ptr<osg::GraphicsContext> CreateRoot(osg::GraphicsContext::Traits& traits,
-                                                  std::unique_ptr<QOpenGLContext> context);
+    osg::ref_ptr<osg::GraphicsContext> CreateRoot(osg::GraphicsContext::Traits& traits);
+    osg::ref_ptr<osg::GraphicsContext> CreateForPane(osg::GraphicsContext::Traits& traits, ViewPane& pane);
+    std::unique_ptr<QOpenGLContext> CreateDriverContext(const osg::GraphicsContext::Traits& traits);
     osg::ref_ptr<osg::GraphicsContext> Fail(const char* reason);
 
     osg::ref_ptr<PaneContext> root;

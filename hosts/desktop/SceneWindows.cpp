@@ -69,4 +69,9 @@ std::unique_ptr<host::ChildFrameWindow> SceneWindows::MakeChildFrame()
     return std::make_unique<Frame>(*this);
 }
 
+host::OpenedWindow SceneWindows::OpenWindow(const host::WindowRequest&)
+{
+    return {nullptr, L"this program shows a scene in the panes of its window only"};
+}
+
 } // namespace desktop

@@ -27,6 +27,9 @@ public:
     ViewArea* GetArea() const;
 
     std::unique_ptr<host::ChildFrameWindow> MakeChildFrame() override;
+
+    /// Refused: the main window with its panes is the only one that this program shows a scene in.
+    host::OpenedWindow OpenWindow(const host::WindowRequest& request) override;
     void SelectObject(const std::wstring& internalId) override { select(internalId); }
 
 private:

@@ -83,7 +83,7 @@ void ViewArea::paintEvent(QPaintEvent*)
     QPainter painter(this);
     painter.fillRect(rect(), palette().color(QPalette::Window));
     const VtCChildFrame* frame = surroundings.GetChildFrame();
-    const VtCPanoramicView* active = frame ? frame->GetActiveView() : nullptr;
+    const VtCBase3DView* active = frame ? frame->GetActiveView() : nullptr;
     if (!active || active->getViewPosition() < 1 || active->getViewPosition() > 4)
         return;
     const ViewPane& pane = GetPaneWindow(active->getViewPosition());

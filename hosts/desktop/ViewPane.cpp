@@ -5,7 +5,6 @@
 #include <QWindow>
 
 #include "hosts/desktop/ViewArea.h"
-#include "render/PanoramicView.h"
 
 namespace desktop
 {
@@ -29,11 +28,6 @@ ViewPane::ViewPane(ViewArea& viewArea, int paneNumber) : QWidget(&viewArea), are
     setFocusPolicy(Qt::ClickFocus);
     setMinimumSize(0, 0);
     hide();
-}
-
-VtCPanoramicView* ViewPane::GetView() const
-{
-    return area.GetView(number);
 }
 
 void ViewPane::SetFormat(const QSurfaceFormat& format)
@@ -96,25 +90,19 @@ bool ViewPane::event(QEvent* event)
 
 void ViewPane::mousePressEvent(QMouseEvent* event)
 {
-    VtCPanoramicView* view = GetView();
-    if (!view)
+    host::WindowEvents* input = GetEvents();
+    if (!input)
         return;
     if (event->button() == Qt::LeftButton)
     {
-        // A Shift that was pressed while another window had the keyboard.
-        SetKey(VtEViewKey::shiftLeft,
-               event->modifiers().testFlag(Qt::ShiftModifier) && !keyDown[static_cast<int>(VtEViewKey::shiftRight)]);
-        pointerInside = true;
+        input->OnShiftState(event->modifiers().testFlag(Qt::ShiftModifier));
         area.SetFlying(true);
         const QPoint at = Pixels(event->position());
-        view->OnLeftButtonDown(at.x(), at.y());
-        area.update();
+        input->OnLeftButtonDown(at.x(), at.y());
     }
     else if (event->button() == Qt::RightButton)
-    {
-        view->OnRightButtonDown();
-        area.update();
-    }
+        input->OnRightButtonDown();
+    area.update();
 }
 
 void ViewPane::mouseReleaseEvent(QMouseEvent* event)
@@ -123,39 +111,31 @@ void ViewPane::mouseReleaseEvent(QMouseEvent* event)
         return;
     area.SetFlying(false);
     const QPoint at = Pixels(event->position());
-    if (VtCPanoramicView* view = GetView())
-        view->OnLeftButtonUp(at.x(), at.y());
+    if (host::WindowEvents* input = GetEvents())
+        input->OnLeftButtonUp(at.x(), at.y());
 }
 
 void ViewPane::mouseMoveEvent(QMouseEvent* event)
 {
-    VtCPanoramicView* view = GetView();
-    if (!view)
-        return;
-    // The toolkit goes on telling of a held pointer outside; for the view it has left.
-    const bool inside = rect().contains(event->position().toPoint());
-    if (pointerInside && !inside)
-        view->OnMouseLeave();
-    pointerInside = inside;
     const QPoint at = Pixels(event->position());
-    if (inside)
-        view->OnMouseMove(at.x(), at.y());
+    if (host::WindowEvents* input = GetEvents())
+        input->OnMouseMove(at.x(), at.y());
 }
 
 void ViewPane::mouseDoubleClickEvent(QMouseEvent* event)
 {
-    VtCPanoramicView* view = GetView();
     const QPoint at = Pixels(event->position());
-    if (view && event->button() == Qt::LeftButton)
-        view->OnLeftDoubleClick(at.x(), at.y());
+    host::WindowEvents* input = GetEvents();
+    if (input && event->button() == Qt::LeftButton)
+        input->OnLeftDoubleClick(at.x(), at.y());
     else
         mousePressEvent(event);
 }
 
 void ViewPane::leaveEvent(QEvent*)
 {
-    if (VtCPanoramicView* view = GetView())
-        view->OnMouseLeave();
+    if (host::WindowEvents* input = GetEvents())
+        input->OnMouseLeave();
 }
 
 void ViewPane::keyPressEvent(QKeyEvent* event)
@@ -175,34 +155,18 @@ bool ViewPane::TellKey(const QKeyEvent& event, bool down)
     const bool tab = event.key() == Qt::Key_Tab || event.key() == Qt::Key_Backtab;
     if (!tab && event.key() != Qt::Key_Shift)
         return false;
-    if (!event.isAutoRepeat())
-        SetKey(tab                                            ? VtEViewKey::tab
-               : event.nativeVirtualKey() == rightShiftSymbol ? VtEViewKey::shiftRight
-                                                              : VtEViewKey::shiftLeft,
-               down);
+    if (host::WindowEvents* input = GetEvents(); input && !event.isAutoRepeat())
+        input->OnKey(tab                                            ? host::ViewKey::tab
+                     : event.nativeVirtualKey() == rightShiftSymbol ? host::ViewKey::shiftRight
+                                                                    : host::ViewKey::shiftLeft,
+                     down);
     return true;
-}
-
-void ViewPane::SetKey(VtEViewKey key, bool down)
-{
-    bool& known = keyDown[static_cast<int>(key)];
-    if (known == down)
-        return;
-    known = down;
-    if (VtCPanoramicView* view = GetView())
-        view->OnKey(key, down);
-}
-
-void ViewPane::ReleaseKeys()
-{
-    for (const VtEViewKey key : {VtEViewKey::tab, VtEViewKey::shiftLeft, VtEViewKey::shiftRight})
-        SetKey(key, false);
 }
 
 void ViewPane::focusOutEvent(QFocusEvent*)
 {
-    // Whoever has the keyboard now hears of the release; the view would keep the key held.
-    ReleaseKeys();
+    if (host::WindowEvents* input = GetEvents())
+        input->OnFocusLost();
 }
 
 void ViewPane::contextMenuEvent(QContextMenuEvent* event)

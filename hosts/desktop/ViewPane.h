@@ -5,9 +5,6 @@
 
 #include "host/ViewWindows.h"
 
-class VtCPanoramicView;
-enum class VtEViewKey;
-
 namespace desktop
 {
 
@@ -22,9 +19,6 @@ public:
 
     /// Pane 1 to 4.
     int GetNumber() const { return number; }
-
-    /// Null until the scene's views are made.
-    VtCPanoramicView* GetView() const;
 
     /// The window takes this format, by becoming another one if it had another.
     void SetFormat(const QSurfaceFormat& format);
@@ -56,14 +50,10 @@ protected:
 private:
     QPoint Pixels(const QPointF& position) const;
     bool TellKey(const QKeyEvent& event, bool down);
-    void SetKey(VtEViewKey key, bool down);
-    void ReleaseKeys();
 
     ViewArea& area;
     int number;
     host::Rectangle place;
-    bool pointerInside = true; ///< while the left button is held
-    bool keyDown[3] = {false, false, false};
 };
 
 } // namespace desktop

@@ -18,7 +18,6 @@
 #include "host/Storage.h"
 #include "records/SceneObjectStore.h"
 #include "render/ChildFrame.h"
-#include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
@@ -114,7 +113,7 @@ void VtCPanoramicApp::ConnectViewer()
     services.hasScene = [this] { return IsSceneLoaded(); };
     services.activeView = [this]() -> osgViewer::View*
     {
-        const VtCPanoramicView* view = GetActiveView();
+        const VtCBase3DView* view = GetActiveView();
         return view ? view->getView() : nullptr;
     };
     setViewerServices(std::move(services));
@@ -268,7 +267,7 @@ void VtCPanoramicApp::StopSimulation()
 
 void VtCPanoramicApp::RenderCurrentView()
 {
-    const VtCPanoramicView* view = GetActiveView();
+    const VtCBase3DView* view = GetActiveView();
     VtCScene3D* scene = view ? view->GetDocument().GetScene() : nullptr;
     if (scene)
         scene->UpdateFrame();
@@ -285,7 +284,7 @@ VtCScene3D* VtCPanoramicApp::GetActiveScene() const
     return document ? document->GetScene() : nullptr;
 }
 
-VtCPanoramicView* VtCPanoramicApp::GetActiveView() const
+VtCBase3DView* VtCPanoramicApp::GetActiveView() const
 {
     const VtCPanoramicDocument* document = GetActiveDocument();
     const VtCChildFrame* frame = document ? document->GetChildFrame() : nullptr;

@@ -22,9 +22,9 @@ class Questions;
 class UserInterface;
 } // namespace host
 
+class VtCBase3DView;
 class VtCGlidePanelToolBarEventsSink;
 class VtCPanoramicDocument;
-class VtCPanoramicView;
 class VtCSceneObjectStore;
 class VtCSimulationDataController;
 class VtCSimulationDataControllerDialog;
@@ -104,7 +104,7 @@ public:
     VtCScene3D* GetActiveScene() const override;
 
     /// The view that has the focus in the active document; null in a host without windows for views.
-    VtCPanoramicView* GetActiveView() const;
+    VtCBase3DView* GetActiveView() const;
     VtIInstrumentFeed* GetActiveInstruments() const override;
 
     /// Null before `StartupCompleted` and after `StartShutdown`.

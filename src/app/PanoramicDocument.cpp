@@ -15,7 +15,6 @@
 #include "records/SceneObject.h"
 #include "records/SceneObjectStore.h"
 #include "render/ChildFrame.h"
-#include "render/PanoramicView.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
 #include "simdata/SimulationDataController.h"
@@ -169,14 +168,12 @@ std::uint32_t VtCPanoramicDocument::GetMouseSensitivity() const
 
 bool VtCPanoramicDocument::IsActiveView(const osgViewer::View* view) const
 {
-    const VtCPanoramicView* active = childFrame ? childFrame->GetActiveView() : nullptr;
-    return active && view && active->getView() == view;
+    return childFrame && childFrame->IsActiveView(view);
 }
 
 const VtC3DObserver* VtCPanoramicDocument::GetActiveObserver() const
 {
-    const VtCPanoramicView* active = childFrame ? childFrame->GetActiveView() : nullptr;
-    return active ? active->getObserver() : nullptr;
+    return childFrame ? childFrame->GetActiveObserver() : nullptr;
 }
 
 void VtCPanoramicDocument::ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver& substitute)

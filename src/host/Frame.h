@@ -22,6 +22,11 @@ public:
     /// `windowNormal` or `windowMinimised`. Throws `InterfaceError` when the window can't be asked.
     virtual std::int32_t GetWindowState() const = 0;
     virtual void SetWindowState(std::int32_t state) = 0;
+
+    /// Takes the window off the screen while windows over whole screens show the scene, and brings it back. A hidden
+    /// window isn't minimised: frames go on.
+    virtual void Hide() = 0;
+    virtual void ShowMaximised() = 0;
 };
 
 /// Values by name that the host shows or follows: the texts of the status line, switches of its behaviour.

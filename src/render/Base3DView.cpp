@@ -3,11 +3,11 @@
 #include "interaction/CameraManipulator.h"
 #include "interaction/Observer.h"
 #include "render/Viewer.h"
-#include "render/ViewFrame.h"
 #include "scene/SceneServices.h"
 
 VtCBase3DView::~VtCBase3DView()
 {
+    frame.ForgetView(*this);
     if (view)
     {
         if (observer)

@@ -9,10 +9,47 @@
 
 #include "host/Graphics.h"
 
+class VtC3DBody;
 class VtC3DObserver;
+class VtC3DObservers;
+class VtCBase3DView;
+class VtCBaseMouseInput;
 class VtCOsgCameramanipulator;
+class VtIInteractionServices;
 class VtISceneDocument;
-class VtIViewFrame;
+
+/// The frame around the views of a scene, as one view sees it. The child frame implements it.
+class VtIViewFrame
+{
+public:
+    virtual ~VtIViewFrame() = default;
+
+    virtual VtISceneDocument& GetDocument() const = 0;
+
+    /// Null without a scene.
+    virtual VtC3DObservers* GetObservers() const = 0;
+
+    virtual VtIInteractionServices& GetInteraction() const = 0;
+
+    /// How many of the four panes look through `observer`.
+    virtual int countViewsOfObserver(const VtC3DObserver& observer) const = 0;
+
+    /// Gives the view the mouse and makes it the scene's active one, a pane or any other.
+    virtual void activateView(VtCBase3DView& view) = 0;
+
+    /// The view that has the focus; null before there is one.
+    virtual VtCBase3DView* GetActiveView() const = 0;
+
+    /// `view` goes away, and isn't looked at any more.
+    virtual void ForgetView(const VtCBase3DView& view) = 0;
+
+    /// Selects a body in the host.
+    virtual void SelectBody(const VtC3DBody& body) = 0;
+
+    /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want
+    /// one. 0 lets the active pane fill the frame.
+    virtual void ApplyLayout(std::int32_t layout) = 0;
+};
 
 /// Everything about a view of the scene except its window: camera, viewport, projection, observer.
 ///
@@ -28,14 +65,17 @@ public:
     virtual void setName(const std::wstring& newName) { name = newName; }
     const std::wstring& getName() const { return name; }
 
-    /// Pane number, 1 to 4.
+    /// Pane number, 1 to 4; 0 for a view that is no pane.
     virtual void setViewPosition(std::int32_t position) { viewPosition = position; }
     std::int32_t getViewPosition() const { return viewPosition; }
 
     VtISceneDocument& GetDocument() const;
 
+    /// Who gets the mouse with this view; null for a view without input of its own.
+    virtual VtCBaseMouseInput* getMouseInput() { return nullptr; }
+
     /// Null is ignored.
-    void attachView(osgViewer::View* newView);
+    virtual void attachView(osgViewer::View* newView);
     osgViewer::View* getView() const { return view.get(); }
 
     /// 0 to 255 each; nothing without a view.

@@ -128,10 +128,38 @@ int VtCChildFrame::countViewsOfObserver(const VtC3DObserver& observer) const
     return count;
 }
 
-void VtCChildFrame::activateView(VtCPanoramicView& view)
+void VtCChildFrame::activateView(VtCBase3DView& view)
 {
     services.mouseInputManager.setActiveInput(view.getMouseInput());
     activeView = &view;
+}
+
+void VtCChildFrame::ForgetView(const VtCBase3DView& view)
+{
+    if (activeView != &view)
+        return;
+    activeView = nullptr;
+    if (VtCPanoramicView* first = splitter ? splitter->getView(1) : nullptr)
+        activateView(*first);
+}
+
+VtCPanoramicView* VtCChildFrame::GetActivePane() const
+{
+    return dynamic_cast<VtCPanoramicView*>(activeView);
+}
+
+bool VtCChildFrame::IsActiveView(const osgViewer::View* view) const
+{
+    const osgViewer::View* own = activeView ? activeView->getView() : nullptr;
+    if (!view || !own || view == own)
+        return view && own;
+    const osgGA::CameraManipulator* manipulator = view->getCameraManipulator();
+    return manipulator && manipulator == own->getCameraManipulator();
+}
+
+const VtC3DObserver* VtCChildFrame::GetActiveObserver() const
+{
+    return activeView ? activeView->getObserver() : nullptr;
 }
 
 void VtCChildFrame::ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id)

@@ -3,8 +3,8 @@
 #include <functional>
 #include <memory>
 
+#include "render/Base3DView.h"
 #include "render/SplitterEx.h"
-#include "render/ViewFrame.h"
 #include "scene/SceneParts.h"
 
 namespace host
@@ -57,9 +57,14 @@ public:
     void setFarClipPlane(float distance);
     void assignObserver(const VtC3DObserver& old, VtC3DObserver& substitute);
 
-    /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want
-    /// one.
-    void ApplyLayout(std::int32_t layout);
+    /// The active view if it is one of the panes; null otherwise.
+    VtCPanoramicView* GetActivePane() const;
+
+    /// Is it the active view's own, or one that the active view's manipulator drives, as that over a whole screen is?
+    bool IsActiveView(const osgViewer::View* view) const;
+
+    /// Whom the active view looks through; null without one.
+    const VtC3DObserver* GetActiveObserver() const;
 
     /// Hides the panes while an editor shows the picture in windows of its own, and shows them again.
     void SetFrameHidden(bool flag);
@@ -69,10 +74,11 @@ public:
     VtC3DObservers* GetObservers() const override { return &services.observers; }
     VtIInteractionServices& GetInteraction() const override { return services.interaction; }
     int countViewsOfObserver(const VtC3DObserver& observer) const override;
-    void activateView(VtCPanoramicView& view) override;
-    VtCPanoramicView* GetActiveView() const override { return activeView; }
+    void activateView(VtCBase3DView& view) override;
+    VtCBase3DView* GetActiveView() const override { return activeView; }
+    void ForgetView(const VtCBase3DView& view) override;
     void SelectBody(const VtC3DBody& body) override;
-    void ShowSingleView() override { ApplyLayout(layoutSingle); }
+    void ApplyLayout(std::int32_t layout) override;
 
     void ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id) override;
     void ApplyLayoutRecord(const std::wstring& id) override { splitter->ApplyLayoutRecord(id); }
@@ -86,7 +92,7 @@ private:
     VtTChildFrameServices services;
     std::unique_ptr<VtCVisualizationViewCommandsHandler> commands;
     std::unique_ptr<host::ChildFrameWindow> window;
-    VtCPanoramicView* activeView = nullptr;
+    VtCBase3DView* activeView = nullptr;
     std::unique_ptr<VtCSplitterEx> splitter;
     bool viewsCreated = false;
     bool frameHidden = false;

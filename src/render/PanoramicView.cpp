@@ -1,31 +1,21 @@
 #include "render/PanoramicView.h"
 
-#include <osgGA/EventQueue>
-#include <osgUtil/LineSegmentIntersector>
-
 #include "base/Ids.h"
 #include "base/Text.h"
 #include "host/Messages.h"
 #include "host/ViewWindows.h"
 #include "interaction/CameraManipulator.h"
-#include "interaction/MouseInput.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
+#include "interaction/Pick.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "render/Viewer.h"
-#include "render/ViewFrame.h"
-#include "render/ViewUserData.h"
-#include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
-#include "scene/StaticBody.h"
-#include "scene/UserData.h"
 
 namespace
 {
-
-using Event = osgGA::GUIEventAdapter;
 
 // Which default observer the next view takes: even calls the first, odd ones the second.
 int createdViews = 0;
@@ -34,25 +24,12 @@ constexpr float nearDistance = 0.015f;
 constexpr float farDistance = 10000.0f;
 constexpr std::uint32_t messageEmptyViewport = 9020;
 
-int KeySymbol(VtEViewKey key)
-{
-    switch (key)
-    {
-    case VtEViewKey::tab:
-        return VtCOsgCameramanipulator::keyTab;
-    case VtEViewKey::shiftLeft:
-        return VtCOsgCameramanipulator::keyShiftLeft;
-    case VtEViewKey::shiftRight:
-        return VtCOsgCameramanipulator::keyShiftRight;
-    }
-    return 0;
-}
-
 } // namespace
 
 VtCPanoramicView::VtCPanoramicView(VtIViewFrame& viewFrame, host::PaneWindow& paneWindow)
-    : VtCBase3DView(viewFrame), window(paneWindow), mouseInput(std::make_unique<VtCBaseMouseInput>())
+    : VtCBase3DView(viewFrame), window(paneWindow), mouseInput(*this)
 {
+    window.SetEvents(&mouseInput);
     osg::ref_ptr<VtISceneObject> record = MakeDefaultObject(objectTypeView);
     if (!record)
         return;
@@ -64,6 +41,7 @@ VtCPanoramicView::VtCPanoramicView(VtIViewFrame& viewFrame, host::PaneWindow& pa
 
 VtCPanoramicView::~VtCPanoramicView()
 {
+    window.SetEvents(nullptr);
     if (osgViewer::View* own = getView())
     {
         removeViewFromViewer(own);
@@ -109,6 +87,12 @@ void VtCPanoramicView::setViewPosition(std::int32_t position)
 {
     VtCBase3DView::setViewPosition(position);
     Write(L"view_pos", position);
+}
+
+void VtCPanoramicView::attachView(osgViewer::View* newView)
+{
+    VtCBase3DView::attachView(newView);
+    mouseInput.Attach(getView());
 }
 
 void VtCPanoramicView::createOsgView()
@@ -199,114 +183,31 @@ bool VtCPanoramicView::TakesInput() const
     return getView() && frame.GetDocument().GetScene();
 }
 
-double VtCPanoramicView::EventTime() const
+void VtCPanoramicView::OnPress()
 {
-    const osg::FrameStamp* stamp = getView()->getFrameStamp();
-    return stamp ? stamp->getSimulationTime() : 0.0;
-}
-
-int VtCPanoramicView::Upwards(int y) const
-{
-    const osg::Viewport* viewport = getView()->getCamera()->getViewport();
-    return (viewport ? static_cast<int>(viewport->height()) : 0) - y;
-}
-
-void VtCPanoramicView::QueueMouse(int eventType, int x, int y)
-{
-    osg::ref_ptr<Event> event = new Event;
-    event->setEventType(static_cast<Event::EventType>(eventType));
-    event->setTime(EventTime());
-    event->setButton(Event::LEFT_MOUSE_BUTTON);
-    event->setX(static_cast<float>(x));
-    event->setY(static_cast<float>(Upwards(y)));
-    getView()->getEventQueue()->addEvent(event.get());
-}
-
-void VtCPanoramicView::OnLeftButtonDown(int x, int y)
-{
-    if (!TakesInput())
-        return;
     frame.activateView(*this);
-    leftButtonDown = true;
-    QueueMouse(Event::PUSH, x, y);
 }
 
-void VtCPanoramicView::OnLeftButtonUp(int x, int y)
+bool VtCPanoramicView::OnPointer()
 {
-    leftButtonDown = false;
-    if (TakesInput())
-        QueueMouse(Event::RELEASE, x, y);
-}
-
-void VtCPanoramicView::OnRightButtonDown()
-{
-    if (TakesInput())
-        frame.activateView(*this);
-}
-
-void VtCPanoramicView::OnMouseLeave()
-{
-    if (!TakesInput())
-        return;
-    osg::ref_ptr<Event> event = new Event;
-    event->setEventType(Event::RELEASE);
-    event->setTime(EventTime());
-    getView()->getEventQueue()->addEvent(event.get());
-}
-
-void VtCPanoramicView::OnMouseMove(int x, int y)
-{
-    if (!TakesInput())
-        return;
     if (clientRect.width <= 0 || clientRect.height <= 0)
     {
         frame.GetDocument().GetServices().messages.Log(messageEmptyViewport, getName());
-        return;
+        return false;
     }
-    VtCPanoramicView* active = frame.GetActiveView();
-    if (active && active != this)
-        active->OnMouseLeave();
-    QueueMouse(leftButtonDown ? Event::DRAG : Event::MOVE, x, y);
+    // The active view may still take the mouse for held.
+    VtCBase3DView* active = frame.GetActiveView();
+    if (auto* input = active && active != this ? dynamic_cast<VtCViewInput*>(active->getMouseInput()) : nullptr)
+        input->OnMouseLeave();
+    return true;
 }
 
-void VtCPanoramicView::OnLeftDoubleClick(int x, int y)
+void VtCPanoramicView::OnDoubleClick(int x, int y)
 {
-    if (!TakesInput())
-        return;
-    getView()->getEventQueue()->getCurrentEventState()->setEventType(Event::DOUBLECLICK);
-    if (const VtC3DBody* body = Pick(x, y))
+    if (const VtC3DBody* body = VtCPick(getView(), x, y).GetBody())
         frame.SelectBody(*body);
     else
-        frame.ShowSingleView();
-}
-
-VtC3DBody* VtCPanoramicView::Pick(int x, int y) const
-{
-    osgUtil::LineSegmentIntersector::Intersections hits;
-    // In the window of the camera: what the queue knows of pointer and window is that of the library's own windows.
-    if (!getView()->computeIntersections(getView()->getCamera(), osgUtil::Intersector::WINDOW, x, Upwards(y), hits))
-        return nullptr;
-    const osg::NodePath& path = hits.begin()->nodePath;
-    for (auto node = path.rbegin(); node != path.rend(); ++node)
-        if (const auto* owner = dynamic_cast<const VtCOsgUserData*>((*node)->getUserData()))
-        {
-            VtCGlidePanelAbstractNavigatorObject* object = owner->owner;
-            if (auto* movable = dynamic_cast<VtC3DMovableBody*>(object))
-                return movable;
-            return dynamic_cast<VtC3DStaticBody*>(object);
-        }
-    return nullptr;
-}
-
-void VtCPanoramicView::OnKey(VtEViewKey key, bool down)
-{
-    if (!TakesInput())
-        return;
-    osg::ref_ptr<Event> event = new Event;
-    event->setEventType(down ? Event::KEYDOWN : Event::KEYUP);
-    event->setTime(EventTime());
-    event->setKey(KeySymbol(key));
-    getView()->getEventQueue()->addEvent(event.get());
+        frame.ApplyLayout(0);
 }
 
 void VtCPanoramicView::OnPaint()

@@ -1,11 +1,12 @@
 #pragma once
 
-#include <memory>
 #include <string>
 
 #include <osg/ref_ptr>
+#include <osg/Referenced>
 
 #include "host/Graphics.h"
+#include "interaction/MouseInput.h"
 #include "records/SceneObject.h"
 #include "render/Base3DView.h"
 
@@ -13,26 +14,22 @@ namespace host
 {
 class PaneWindow;
 }
-namespace osg
-{
-class Node;
-}
-class VtC3DBody;
-class VtCBaseMouseInput;
+class VtCPanoramicView;
 
-/// Keys that reach a view.
-enum class VtEViewKey
+/// Tells which pane an `osgViewer::View` belongs to.
+class VtCOsgViewUserData : public osg::Referenced
 {
-    tab,
-    shiftLeft, ///< also a Shift without a side
-    shiftRight,
+public:
+    explicit VtCOsgViewUserData(VtCPanoramicView& viewOwner) : owner(&viewOwner) {}
+
+    VtCPanoramicView* owner; ///< not owned; null once the pane is gone
 };
 
 /// One of the four panes of a scene: a window with a view, an observer and a record.
 ///
-/// The host tells of window events by the operations whose names begin with "On"; positions in pixels from the upper
-/// left corner. They do nothing unless a scene is loaded and the view exists.
-class VtCPanoramicView : public VtCBase3DView, private IPropertyChangedCOMEvents
+/// Its input takes what the window tells: a press makes it the active view, a double click selects the body under the
+/// pointer, or lets this view fill the frame.
+class VtCPanoramicView : public VtCBase3DView, private IPropertyChangedCOMEvents, private VtIViewInputOwner
 {
 public:
     /// The window outlives the view. The record goes into the document's store.
@@ -49,7 +46,8 @@ public:
     bool assignObserverByName(const std::wstring& observerName);
 
     host::PaneWindow& getWindow() const { return window; }
-    VtCBaseMouseInput* getMouseInput() const { return mouseInput.get(); }
+    VtCBaseMouseInput* getMouseInput() override { return &mouseInput; }
+    void attachView(osgViewer::View* newView) override;
 
     /// "internal_id", "name", "observer", "track", "view_angle", "front_clip_plane", "back_clip_plane", "view_pos".
     VtISceneObject* getSceneObject() const { return sceneObject.get(); }
@@ -60,35 +58,25 @@ public:
     /// Takes over the record that the store holds under `id`; nothing without one.
     void RebindAttributes(const std::wstring& id);
 
-    void OnLeftButtonDown(int x, int y);
-    void OnLeftButtonUp(int x, int y);
-    void OnRightButtonDown();
-    void OnMouseMove(int x, int y);
-    void OnMouseLeave();
-
-    /// Selects the body under the pointer; a click on nothing lets this view fill the frame.
-    void OnLeftDoubleClick(int x, int y);
-    void OnKey(VtEViewKey key, bool down);
+    /// Draws all views, when a scene is loaded and the view exists.
     void OnPaint();
 
     /// The window has another size. Without width or height the view leaves the viewer, and joins it again later.
     void OnSize();
 
 private:
-    bool TakesInput() const;
-    double EventTime() const;
-    int Upwards(int y) const;
-    void QueueMouse(int eventType, int x, int y);
-    VtC3DBody* Pick(int x, int y) const;
+    bool TakesInput() const override;
+    void OnPress() override;
+    bool OnPointer() override;
+    void OnDoubleClick(int x, int y) override;
     void AttributeChanged(const std::wstring& attribute, const VtTAttributeValue& value);
     void OnPropertyChanged(VtISceneObject& object, VtISceneAttribute& attribute) override;
     void Write(const wchar_t* attribute, VtTAttributeValue value);
     void Listen(VtISceneObject* record);
 
     host::PaneWindow& window;
-    std::unique_ptr<VtCBaseMouseInput> mouseInput;
+    VtCViewInput mouseInput;
     host::Rectangle clientRect;
-    bool leftButtonDown = false;
     bool writing = false; ///< its own writes don't come back to it
     osg::ref_ptr<VtISceneObject> sceneObject;
 };

@@ -9,7 +9,6 @@
 #include "records/SceneObjectStore.h"
 #include "render/PanoramicView.h"
 #include "render/Viewer.h"
-#include "render/ViewFrame.h"
 #include "scene/SceneServices.h"
 
 namespace
@@ -92,7 +91,7 @@ void VtCSplitterEx::setLayout(std::int32_t newLayout)
     {
     case layoutSingle:
     {
-        const VtCPanoramicView* active = frame.GetActiveView();
+        const VtCBase3DView* active = frame.GetActiveView();
         if (!active || !getView(active->getViewPosition()))
             return;
         const Place place = PlaceOf(active->getViewPosition());
@@ -154,7 +153,7 @@ void VtCSplitterEx::setSplitterPosition(double x, double y)
 
 void VtCSplitterEx::setPaneSizeFromActiveView(int width, int height)
 {
-    const VtCPanoramicView* active = frame.GetActiveView();
+    const VtCBase3DView* active = frame.GetActiveView();
     if (!active || !getView(active->getViewPosition()))
         return;
     const host::Rectangle client = window.GetClientRectangle();

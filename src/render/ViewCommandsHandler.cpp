@@ -2,8 +2,8 @@
 
 #include <optional>
 
-#include "render/ChildFrame.h"
-#include "render/PanoramicView.h"
+#include "render/Base3DView.h"
+#include "render/SplitterEx.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
 

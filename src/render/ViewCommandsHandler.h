@@ -4,7 +4,6 @@
 
 #include "host/CommandState.h"
 
-class VtCChildFrame;
 class VtCScene3D;
 class VtIViewFrame;
 
@@ -30,7 +29,7 @@ enum VtEViewCommand : std::uint32_t
 class VtCVisualizationViewCommandsHandler
 {
 public:
-    explicit VtCVisualizationViewCommandsHandler(VtCChildFrame& childFrame) : frame(childFrame) {}
+    explicit VtCVisualizationViewCommandsHandler(VtIViewFrame& viewFrame) : frame(viewFrame) {}
 
     /// True for a command of the views, enabled or not; a disabled one does nothing.
     bool Execute(std::uint32_t command);
@@ -41,5 +40,5 @@ public:
 private:
     VtCScene3D* Scene() const;
 
-    VtCChildFrame& frame;
+    VtIViewFrame& frame;
 };

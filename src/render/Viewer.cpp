@@ -11,6 +11,7 @@
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "host/Clock.h"
+#include "host/ViewWindows.h"
 #include "render/CompositeViewer.h"
 #include "render/GpRenderer.h"
 #include "render/Statistics.h"
@@ -198,7 +199,8 @@ void createSharedContext(host::Window& window)
 {
     sharedContextWindow = &window;
     const osg::ref_ptr<osg::GraphicsContext::Traits> traits = MakeTraits();
-    sharedContext = services.graphics ? services.graphics->CreateContext(*traits, window) : nullptr;
+    sharedContext =
+        services.graphics ? services.graphics->CreateContext({host::WindowKind::root, window, *traits}) : nullptr;
 }
 
 osg::GraphicsContext* getSharedContext()
@@ -206,7 +208,7 @@ osg::GraphicsContext* getSharedContext()
     return sharedContext.get();
 }
 
-osg::ref_ptr<osg::GraphicsContext> createViewContext(host::Window& window)
+osg::ref_ptr<osg::GraphicsContext> createViewContext(host::ViewWindow& window)
 {
     if (!services.graphics)
         return nullptr;
@@ -216,10 +218,10 @@ osg::ref_ptr<osg::GraphicsContext> createViewContext(host::Window& window)
     traits->width = client.width;
     traits->height = client.height;
     traits->sharedContext = sharedContext.get();
-    return services.graphics->CreateContext(*traits, window);
+    return services.graphics->CreateContext({window.GetKind(), window, *traits});
 }
 
-osg::ref_ptr<osgViewer::View> createView(host::Window& window, const host::Rectangle& rectangle)
+osg::ref_ptr<osgViewer::View> createView(host::ViewWindow& window, const host::Rectangle& rectangle)
 {
     osg::ref_ptr<osgViewer::View> view = new osgViewer::View;
     osg::ref_ptr<osg::DisplaySettings> settings = new osg::DisplaySettings;

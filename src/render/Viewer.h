@@ -14,6 +14,7 @@
 namespace host
 {
 class Clock;
+class ViewWindow;
 } // namespace host
 
 namespace osgViewer
@@ -70,14 +71,14 @@ void createSharedContext(host::Window& window);
 /// The root context; null before `createSharedContext`, or when the platform refused.
 osg::GraphicsContext* getSharedContext();
 
-/// A context that draws to `window` in its present size. Null when the platform refuses; the host's graphics then know
-/// why. A context isn't resized: a window of another size takes a new one.
-osg::ref_ptr<osg::GraphicsContext> createViewContext(host::Window& window);
+/// A context that draws to `window` in its present size, of the window's kind. Null when the platform refuses; the
+/// host's graphics then know why. A context isn't resized: a window of another size takes a new one.
+osg::ref_ptr<osg::GraphicsContext> createViewContext(host::ViewWindow& window);
 
 /// A view for `window` with its renderer, camera and context, not yet in the viewer. Its viewport has the size of
 /// `rectangle`; if that is empty, of the window on which the shared context was made. The field of view is 80 degrees
 /// across in a landscape window (the height follows) and 40 degrees upright in a portrait one.
-osg::ref_ptr<osgViewer::View> createView(host::Window& window, const host::Rectangle& rectangle);
+osg::ref_ptr<osgViewer::View> createView(host::ViewWindow& window, const host::Rectangle& rectangle);
 
 /// Both do nothing for null, or while `viewerReady` is false. A view out of the viewer keeps its camera and context.
 void addViewToViewer(osgViewer::View* view);

@@ -52,8 +52,11 @@ public:
         return state;
     }
     void SetWindowState(std::int32_t newState) override { state = newState; }
+    void Hide() override { shown = false; }
+    void ShowMaximised() override { shown = true; }
 
     std::int32_t state = host::windowNormal;
+    bool shown = true;
     bool fails = false;
 };
 

@@ -73,6 +73,7 @@ public:
     {
         return std::make_unique<ChildFrameWindow>(splitter, periods, ticks);
     }
+    host::OpenedWindow OpenWindow(const host::WindowRequest&) override { return {nullptr, L"only a frame"}; }
     void SelectObject(const std::wstring& internalId) override { selected.push_back(internalId); }
 
     /// Lets every timer fire once; a tick may end its own timer.

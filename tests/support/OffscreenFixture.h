@@ -11,7 +11,7 @@
 #include <osgViewer/View>
 
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/OffscreenWindow.h"
+#include "hosts/common/OffscreenViews.h"
 #include "render/Viewer.h"
 #include "tests/support/FakeHost.h"
 

@@ -6,7 +6,7 @@
 #include "app/PanoramicDocument.h"
 #include "base/Paths.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/OffscreenWindow.h"
+#include "hosts/common/OffscreenViews.h"
 #include "hosts/common/Picture.h"
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"

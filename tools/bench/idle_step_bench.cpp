@@ -12,7 +12,7 @@
 
 #include "app/PanoramicDocument.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/OffscreenWindow.h"
+#include "hosts/common/OffscreenViews.h"
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"

@@ -4,7 +4,7 @@
 
 #include "base/Text.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/OffscreenWindow.h"
+#include "hosts/common/OffscreenViews.h"
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"

@@ -3,6 +3,8 @@
 #include <gtest/gtest.h>
 
 #include "hosts/common/EglGraphics.h"
+#include "hosts/common/OffscreenViews.h"
+#include "hosts/common/Picture.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/MouseInput.h"
 #include "interaction/Observer.h"
@@ -78,14 +80,8 @@ protected:
     }
 
     std::uint32_t GetMouseSensitivity() const override { return 5; }
-    bool IsActiveView(const osgViewer::View* view) const override
-    {
-        return frame && frame->GetActiveView() && frame->GetActiveView()->getView() == view;
-    }
-    const VtC3DObserver* GetActiveObserver() const override
-    {
-        return frame && frame->GetActiveView() ? frame->GetActiveView()->getObserver() : nullptr;
-    }
+    bool IsActiveView(const osgViewer::View* view) const override { return frame && frame->IsActiveView(view); }
+    const VtC3DObserver* GetActiveObserver() const override { return frame ? frame->GetActiveObserver() : nullptr; }
     void SetHeadLightPosition(const osg::Vec3f&) override {}
     void ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver& substitute) override
     {
@@ -277,11 +273,12 @@ TEST_F(Views, TheMouseDrivesAFreeObserver)
     RenderViewerFrame();
     const double start = Eye(pane).y();
 
-    pane.OnLeftButtonDown(100, 250);
+    host::WindowEvents& window = *pane.getWindow().GetEvents();
+    window.OnLeftButtonDown(100, 250);
     EXPECT_EQ(frame->GetActiveView(), &pane) << "a click activates";
     EXPECT_EQ(mouse.getCurrentInput(), pane.getMouseInput());
     RenderViewerFrame();
-    pane.OnMouseMove(100, 150); // window coordinates: 100 pixels up
+    window.OnMouseMove(100, 150); // window coordinates: 100 pixels up
     RenderViewerFrame();
     const double afterDrag = Eye(pane).y();
     RenderViewerFrame();
@@ -290,7 +287,7 @@ TEST_F(Views, TheMouseDrivesAFreeObserver)
     EXPECT_GT(afterDrag, start);
     EXPECT_NEAR(Eye(Pane(1)).y(), Eye(pane).y(), 1e-9) << "pane 1 looks through the same observer";
 
-    pane.OnMouseLeave();
+    window.OnMouseLeave();
     RenderViewerFrame();
     const double released = Eye(pane).y();
     RenderViewerFrame();
@@ -298,26 +295,6 @@ TEST_F(Views, TheMouseDrivesAFreeObserver)
     EXPECT_NEAR(observer.GetPosition().y(), released, 1e-4);
     const auto* stored = observer.GetAttributeObject()->Find<VtTFloatTupel3>(L"position");
     EXPECT_NEAR((*stored)[1], released, 1e-4);
-}
-
-TEST_F(Views, KeysReachTheManipulator)
-{
-    CreateViews();
-    VtCPanoramicView& pane = Pane(4);
-    VtC3DObserver& observer = *pane.getObserver();
-    observer.StoreFreeView(osg::Vec3f(0, 0, 2), osg::Quat(osg::PI_2, osg::Vec3d(1, 0, 0)));
-    observer.PushViewMatrix();
-    RenderViewerFrame();
-    pane.OnKey(VtEViewKey::shiftLeft, true);
-    pane.OnLeftButtonDown(100, 250);
-    RenderViewerFrame();
-    pane.OnMouseMove(100, 150);
-    RenderViewerFrame();
-    RenderViewerFrame();
-    EXPECT_GT(Eye(pane).z(), 2.2) << "Shift pans up";
-    EXPECT_NEAR(Eye(pane).y(), 0, 1e-6);
-    pane.OnLeftButtonUp(100, 150);
-    RenderViewerFrame();
 }
 
 TEST_F(Views, ADoubleClickSelectsWhatIsSeen)
@@ -333,11 +310,75 @@ TEST_F(Views, ADoubleClickSelectsWhatIsSeen)
     RenderViewerFrame();
 
     const host::Rectangle size = pane.getWindow().GetClientRectangle();
-    pane.OnLeftDoubleClick(size.width / 2, size.height / 2);
+    pane.getWindow().GetEvents()->OnLeftDoubleClick(size.width / 2, size.height / 2);
     EXPECT_EQ(windows.selected, (std::vector<std::wstring>{body.GetInternalId()}));
     EXPECT_EQ(PanesInViewer().size(), 4u);
-    pane.OnLeftDoubleClick(5, 5);
+    pane.getWindow().GetEvents()->OnLeftDoubleClick(5, 5);
     EXPECT_EQ(PanesInViewer(), (std::vector<int>{1})) << "a click on nothing enlarges the pane";
+}
+
+// A view over a whole screen: its window is no pane, and the manipulator of the active pane drives it.
+TEST_F(Views, OfEveryKindShareTheRootAndShowTheScene)
+{
+    CreateViews();
+    hosts::OffscreenViews opener(clock);
+    opener.SetSize(320, 200);
+    const host::WindowRequest requests[] = {
+        {.kind = host::WindowKind::fullscreen},
+        {.kind = host::WindowKind::editorView, .width = 160, .height = 100},
+    };
+    for (const host::WindowRequest& request : requests)
+    {
+        SCOPED_TRACE(static_cast<int>(request.kind));
+        const host::OpenedWindow opened = opener.OpenWindow(request);
+        ASSERT_TRUE(opened.window);
+        EXPECT_EQ(opened.window->GetKind(), request.kind);
+        const host::Rectangle size = opened.window->GetClientRectangle();
+        const osg::ref_ptr<osgViewer::View> view = createView(*opened.window, size);
+        osg::GraphicsContext* context = view->getCamera()->getGraphicsContext();
+        ASSERT_TRUE(context);
+        EXPECT_EQ(context->getState()->getContextID(), getSharedContext()->getState()->getContextID());
+        view->setSceneData(scene->GetRootNode());
+        view->getCamera()->setClearColor({0, 1, 0, 1});
+        addViewToViewer(view.get());
+        RenderViewerFrame();
+        const osg::ref_ptr<osg::Image> picture = hosts::ReadPicture(*view->getCamera());
+        ASSERT_TRUE(picture);
+        EXPECT_EQ(picture->s(), size.width);
+        EXPECT_EQ(picture->getColor(5, 5).g(), 1.0F);
+
+        EXPECT_FALSE(frame->IsActiveView(view.get()));
+        view->setCameraManipulator(Pane(1).getView()->getCameraManipulator(), false);
+        EXPECT_TRUE(frame->IsActiveView(view.get()));
+        view->setCameraManipulator(nullptr);
+        removeViewFromViewer(view.get());
+    }
+    EXPECT_EQ(PanesInViewer().size(), 4u) << "the panes' contexts are still good";
+    EXPECT_TRUE(Pane(1).getView()->getCamera()->getGraphicsContext()->valid());
+
+    const host::OpenedWindow refused = opener.OpenWindow({.kind = host::WindowKind::pane});
+    EXPECT_FALSE(refused.window);
+    EXPECT_FALSE(refused.refusal.empty());
+}
+
+// A view that is no pane can have the focus, and hands it back when it goes.
+TEST_F(Views, TheActiveOneMayBeAnyView)
+{
+    CreateViews();
+    {
+        VtCBase3DView other(*frame);
+        other.attachView(new osgViewer::View);
+        other.assignObserver(observers->GetFree2());
+        frame->activateView(other);
+        EXPECT_TRUE(frame->IsActiveView(other.getView()));
+        EXPECT_FALSE(frame->IsActiveView(Pane(1).getView()));
+        EXPECT_EQ(frame->GetActiveObserver(), observers->GetFree2());
+        EXPECT_EQ(frame->GetActivePane(), nullptr);
+        frame->ApplyLayout(layoutSingle);
+        EXPECT_EQ(PanesInViewer().size(), 4u) << "it fills no frame";
+        EXPECT_EQ(mouse.getCurrentInput(), Pane(1).getMouseInput()) << "it has no input of its own";
+    }
+    EXPECT_EQ(frame->GetActivePane(), &Pane(1));
 }
 
 TEST_F(Views, CommandsKnowTheirState)
