@@ -269,7 +269,7 @@ PreparedText PrepareCollada(std::string content, ReadContext& context)
         const std::string path = context.Find(std::string(base::Trim(image.child_value())), "texture");
         if (path.empty())
             continue;
-        image.text().set(UriOf(path).c_str());
+        image.text().set(context.AliasOf(path).c_str());
         context.textures.insert(path);
     }
     for (const pugi::xml_node shading : elements.Named("lambert"))

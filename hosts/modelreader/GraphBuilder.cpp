@@ -12,7 +12,7 @@
 #include <osg/TriangleIndexFunctor>
 #include <osgUtil/SmoothingVisitor>
 
-#include "GeometryCheck.h"
+#include "assets/models/GeometryCheck.h"
 #include "Preparation.h"
 #include "StateBuilder.h"
 
@@ -35,12 +35,40 @@ osg::ref_ptr<osg::Group> EmptyLike(osg::Node& source)
             throw std::runtime_error("it has a transform whose numbers are none");
         return matrix.isIdentity() ? new osg::Group : new osg::MatrixTransform(matrix);
     }
-    // Copied with their settings, then emptied: ranges and switch values go by index.
-    if (auto* lod = dynamic_cast<osg::LOD*>(&source); lod && std::strcmp(lod->className(), "LOD") == 0)
-        return new osg::LOD(*lod);
-    if (osg::Switch* choice = source.asSwitch())
-        return new osg::Switch(*choice);
+    if (const auto* lod = dynamic_cast<const osg::LOD*>(&source); lod && std::strcmp(lod->className(), "LOD") == 0)
+    {
+        osg::ref_ptr<osg::LOD> copy = new osg::LOD;
+        copy->setCenterMode(lod->getCenterMode());
+        copy->setCenter(lod->getCenter());
+        copy->setRadius(lod->getRadius());
+        copy->setRangeMode(lod->getRangeMode());
+        copy->setRangeList(lod->getRangeList());
+        return copy;
+    }
+    if (const osg::Switch* choice = source.asSwitch())
+    {
+        osg::ref_ptr<osg::Switch> copy = new osg::Switch;
+        copy->setValueList(choice->getValueList());
+        return copy;
+    }
     return source.asGroup() ? new osg::Group : nullptr;
+}
+
+/// The shape of `source` and nothing else: skins and morph targets are shown as they stand, and callbacks of classes
+/// that nobody here knows stay behind.
+osg::ref_ptr<osg::Geometry> PlainCopy(osg::Geometry& source)
+{
+    if (source.containsDeprecatedData())
+        source.fixDeprecatedData();
+    osg::ref_ptr<osg::Geometry> geometry = new osg::Geometry;
+    geometry->setStateSet(source.getStateSet());
+    geometry->setVertexArray(source.getVertexArray());
+    geometry->setNormalArray(source.getNormalArray());
+    geometry->setColorArray(source.getColorArray());
+    geometry->setTexCoordArrayList(source.getTexCoordArrayList());
+    geometry->setPrimitiveSetList(source.getPrimitiveSetList());
+    geometry->setDataVariance(osg::Object::STATIC);
+    return geometry;
 }
 
 bool NeedsNormals(const osg::Geometry& geometry)
@@ -160,7 +188,10 @@ GraphBuilder::Built GraphBuilder::BuildNode(osg::Node& source, const Inherited& 
     else if (osg::ref_ptr<osg::Group> group = EmptyLike(source))
     {
         const osg::Group* from = source.asGroup();
-        const bool byIndex = group->getNumChildren() > 0;
+        // Ranges and values of these go by index, so a child that falls away leaves its place empty.
+        const bool byIndex = group->asSwitch() || dynamic_cast<osg::LOD*>(group.get());
+        auto* choice = group->asSwitch();
+        const osg::Switch::ValueList values = choice ? choice->getValueList() : osg::Switch::ValueList{};
         for (unsigned i = 0; i < from->getNumChildren(); ++i)
         {
             const Built child = BuildNode(const_cast<osg::Node&>(*from->getChild(i)), inherited, depth + 1);
@@ -168,16 +199,13 @@ GraphBuilder::Built GraphBuilder::BuildNode(osg::Node& source, const Inherited& 
             if (built.paths > maxPaths)
                 throw std::runtime_error("it has more than two million nodes");
             if (byIndex)
-                group->setChild(i, child.node ? child.node.get() : new osg::Group);
+                group->osg::Group::addChild(child.node ? child.node.get() : new osg::Group);
             else if (child.node)
                 group->addChild(child.node);
         }
+        if (choice)
+            choice->setValueList(values);
         group->setName(name);
-        group->setStateSet(nullptr);
-        group->setUserDataContainer(nullptr);
-        group->setUpdateCallback(nullptr);
-        group->setEventCallback(nullptr);
-        group->setCullCallback(nullptr);
         group->setDataVariance(osg::Object::STATIC);
         built.node = group;
     }
@@ -196,17 +224,10 @@ osg::ref_ptr<osg::Node> GraphBuilder::BuildGeode(osg::Geode& source, const Inher
 
 void GraphBuilder::AddDrawable(osg::Geode& geode, osg::Drawable* drawable, const Inherited& inherited)
 {
-    const osg::Geometry* source = drawable ? drawable->asGeometry() : nullptr;
+    osg::Geometry* source = drawable ? drawable->asGeometry() : nullptr;
     if (!source)
         return;
-    // A plain geometry, whatever it was: skins and morph targets are shown as they stand.
-    osg::ref_ptr<osg::Geometry> geometry = new osg::Geometry(*source);
-    geometry->setUserDataContainer(nullptr);
-    geometry->setUpdateCallback(nullptr);
-    geometry->setEventCallback(nullptr);
-    geometry->setCullCallback(nullptr);
-    geometry->setDrawCallback(nullptr);
-    geometry->setDataVariance(osg::Object::STATIC);
+    osg::ref_ptr<osg::Geometry> geometry = PlainCopy(*source);
 
     osg::Geometry::ArrayList coordinates;
     for (unsigned unit = 0; unit < StateBuilder::maxUnits; ++unit)

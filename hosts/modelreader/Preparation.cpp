@@ -4,7 +4,6 @@
 #include <filesystem>
 
 #include <osgDB/FileNameUtils>
-#include <osgDB/FileUtils>
 
 #include "base/Numbers.h"
 #include "base/Paths.h"
@@ -36,7 +35,7 @@ std::string PlainPath(const std::string& reference)
     std::string path = reference;
     if (path.starts_with("file://"))
     {
-        path = PercentDecoded(path.substr(7));
+        path.erase(0, 7);
         if (const std::size_t slash = path.find('/'); slash != std::string::npos)
             path.erase(0, slash); // the host part
     }
@@ -46,24 +45,77 @@ std::string PlainPath(const std::string& reference)
     return path;
 }
 
+/// The file `path` below `folder` whatever its case is; empty when there is none. The library's own search begins with
+/// the root of all folders, which may not be read here.
+fs::path WithAnyCase(const fs::path& path, fs::path folder)
+{
+    std::error_code error;
+    for (const fs::path& name : path)
+    {
+        fs::path next = folder / name;
+        if (!fs::exists(next, error))
+        {
+            const auto isSame = [&](const fs::directory_entry& entry)
+            { return base::EqualsNoCase(base::Wide(entry.path().filename().string()), base::Wide(name.string())); };
+            const fs::directory_iterator end;
+            const auto at = std::find_if(fs::directory_iterator(folder, error), end, isSame);
+            if (at == end)
+                return {};
+            next = at->path();
+        }
+        folder = next;
+    }
+    return folder;
+}
+
 std::string InFolder(const std::string& path, const std::string& folder)
 {
     std::error_code error;
     const fs::path plain = fs::path(folder) / path; // an absolute path stays as it is
     if (fs::is_regular_file(plain, error))
         return plain.lexically_normal().string();
-    if (folder.empty())
-        return {};
-    const std::string found = osgDB::findFileInDirectory(path, folder, osgDB::CASE_INSENSITIVE);
-    return !found.empty() && fs::is_regular_file(found, error) ? fs::path(found).lexically_normal().string() : "";
+    const fs::path found = folder.empty() ? fs::path() : WithAnyCase(fs::path(path).relative_path(), folder);
+    return fs::is_regular_file(found, error) ? found.lexically_normal().string() : "";
+}
+
+/// The folders that a model may be made from. Where the model is a link, its file's own folder counts, too.
+std::vector<std::string> RootsOf(const ModelRequest& request)
+{
+    std::vector<std::string> roots;
+    const auto add = [&](const fs::path& path)
+    {
+        std::error_code error;
+        const fs::path root = fs::canonical(path, error);
+        if (!error && !path.empty())
+            roots.push_back(root.string());
+    };
+    std::error_code error;
+    add(fs::absolute(request.path).lexically_normal().parent_path());
+    add(fs::canonical(request.path, error).parent_path());
+    for (const char* library : {"vtCustomerPath", "vtObjectsPath"})
+        add(base::NativePath(base::Wide(request.Text(library))));
+    return roots;
 }
 
 } // namespace
 
 ReadContext::ReadContext(ModelRequest modelRequest)
     : request(std::move(modelRequest)),
-      folder(fs::absolute(fs::path(request.path)).lexically_normal().parent_path().string())
+      folder(fs::absolute(fs::path(request.path)).lexically_normal().parent_path().string()),
+      roots(RootsOf(request))
 {
+}
+
+bool ReadContext::IsWithinReach(const std::string& path) const
+{
+    std::error_code error;
+    const fs::path real = fs::weakly_canonical(fs::path(folder) / path, error);
+    return !error && std::any_of(roots.begin(), roots.end(),
+                                 [&](const std::string& root)
+                                 {
+                                     const fs::path below = real.lexically_relative(root);
+                                     return !below.empty() && *below.begin() != "..";
+                                 });
 }
 
 void ReadContext::Warn(const std::string& sentence)
@@ -87,12 +139,22 @@ void ReadContext::NoteFile(const std::string& path)
         report.files.push_back(stamp);
 }
 
+std::string ReadContext::AliasOf(const std::string& path)
+{
+    const std::string ending = osgDB::getLowerCaseFileExtension(path);
+    const std::string alias = "texture-" + std::to_string(aliases.size()) + "." + ending;
+    return aliases.emplace(alias, path).first->first;
+}
+
 std::string ReadContext::Find(const std::string& reference, const std::string& what)
 {
-    const std::string path = PlainPath(reference);
-    const std::string bare = osgDB::getSimpleFileName(path);
-    if (!bare.empty())
+    const std::string written = PlainPath(reference);
+    for (const bool decodes : {false, true})
     {
+        const std::string path = decodes ? PercentDecoded(written) : written;
+        const std::string bare = osgDB::getSimpleFileName(path);
+        if (bare.empty() || (decodes && path == written))
+            continue;
         const std::pair<std::string, std::string> places[] = {
             {path, folder},
             {bare, folder},
@@ -100,13 +162,15 @@ std::string ReadContext::Find(const std::string& reference, const std::string& w
             {path, base::NativePath(base::Wide(request.Text("vtObjectsPath"))).string()},
         };
         for (const auto& [name, place] : places)
-            if (const std::string found = InFolder(name, place); !found.empty())
+            if (const std::string found = InFolder(name, place); !found.empty() && IsWithinReach(found))
             {
                 NoteFile(found);
                 return found;
             }
         NoteFile((fs::path(folder) / path).lexically_normal().string());
     }
-    Warn("the " + what + " \"" + reference + "\" is missing");
+    const bool outside = !written.empty() && !IsWithinReach(written);
+    Warn("the " + what + " \"" + reference + "\" " +
+         (outside ? "lies outside the model's folder and the libraries, where nothing is read" : "is missing"));
     return {};
 }

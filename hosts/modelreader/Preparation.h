@@ -1,7 +1,9 @@
 #pragma once
 
+#include <map>
 #include <set>
 #include <string>
+#include <vector>
 
 #include <osg/Matrixd>
 
@@ -23,13 +25,22 @@ public:
     /// a note of where it was looked for, when there is none.
     std::string Find(const std::string& reference, const std::string& what);
 
+    /// A name for the texture `path` that no reader can misread, whatever the path holds (blanks, "%24", "$").
+    std::string AliasOf(const std::string& path);
+
     /// Takes down a file that the model depends on.
     void NoteFile(const std::string& path);
 
+    /// Whether `path` lies below one of `roots`, links followed.
+    bool IsWithinReach(const std::string& path) const;
+
     const ModelRequest request;
     const std::string folder; ///< of the model, without a trailing slash
+    const std::vector<std::string>
+        roots; ///< all that may be read: the model's folder and the libraries, links followed
     ModelReport report;
-    std::set<std::string> textures; ///< files that the graph must hold as images in the end
+    std::set<std::string> textures;             ///< files that the graph must hold as images in the end
+    std::map<std::string, std::string> aliases; ///< name given to the stock reader -> such a file
 
 private:
     std::size_t warnings = 0;

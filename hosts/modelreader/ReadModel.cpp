@@ -3,7 +3,6 @@
 #include <filesystem>
 #include <fstream>
 #include <set>
-#include <sstream>
 #include <stdexcept>
 
 #include <osg/Geometry>
@@ -11,11 +10,12 @@
 #include <osg/TriangleIndexFunctor>
 #include <osgDB/FileNameUtils>
 #include <osgDB/ReadFile>
-#include <osgDB/Registry>
 #include <osgUtil/MeshOptimizers>
 #include <osgUtil/Optimizer>
 
+#include "assets/models/ModelGraph.h"
 #include "ColladaText.h"
+#include "Confinement.h"
 #include "Description.h"
 #include "GraphBuilder.h"
 #include "Preparation.h"
@@ -103,36 +103,38 @@ osg::ref_ptr<osg::Group> Placed(osg::ref_ptr<osg::Group> graph, osg::Matrixd mat
     return graph;
 }
 
-std::string Encode(const osg::Group& graph)
+PreparedText Prepare(const std::string& extension, std::string content, ReadContext& context)
 {
-    osgDB::ReaderWriter* binary = osgDB::Registry::instance()->getReaderWriterForExtension("osgb");
-    if (!binary)
-        throw std::runtime_error("the scene graph library's plug-in for \"osgb\" is missing");
-    osg::ref_ptr<osgDB::Options> options = new osgDB::Options("WriteImageHint=IncludeData");
-    options->setPluginStringData("WriteImageHint", "IncludeData");
-    std::ostringstream stream;
-    if (!binary->writeNode(graph, stream, options.get()).success() || !stream)
-        throw std::runtime_error("it can't be handed on");
-    return std::move(stream).str();
+    if (extension == "wrl")
+        return PrepareVrml(std::move(content), context);
+    if (extension == "dae")
+        return PrepareCollada(std::move(content), context);
+    PreparedText prepared; // read as a service: nothing is filled in, and what isn't OBJ stands z-up by custom
+    if (extension != "obj")
+        prepared.toModel = osg::Matrixd(1, 0, 0, 0, 0, 0, -1, 0, 0, 1, 0, 0, 0, 0, 0, 1);
+    return prepared;
 }
 
 std::string ReadChecked(ReadContext& context)
 {
     const ModelRequest& request = context.request;
+    if (!HasModelFormat(request.path))
+        throw std::runtime_error(std::string("of models only these formats are read: ") + modelFormats);
+    const std::string extension = osgDB::getLowerCaseFileExtension(request.path);
     context.NoteFile(request.path);
     std::string content = ReadWholeFile(request.path);
-    fs::current_path(context.folder);
+    LoadStockReaders(extension, context);
+    fs::current_path(context.folder); // not before: libraries are also looked for in the working directory
+    context.report.notes = Confine(context.roots);
     const Description description(context);
 
-    const std::string extension = osgDB::getLowerCaseFileExtension(request.path);
-    PreparedText prepared =
-        extension == "wrl" ? PrepareVrml(std::move(content), context) : PrepareCollada(std::move(content), context);
+    PreparedText prepared = Prepare(extension, std::move(content), context);
     StateBuilder states(context, prepared.mainTextureUnit);
     osg::ref_ptr<osg::Group> graph;
     std::string complaint;
     {
         // The stock graph goes before transforms are worked into vertices, or every array would be copied once more.
-        const StockGraph stock = ReadWithStockReader(extension, std::move(prepared.text));
+        const StockGraph stock = ReadWithStockReader(extension, std::move(prepared.text), request.path);
         graph = GraphBuilder(context, states).Build(*stock.root, prepared.hasTurnedRoot);
         complaint = stock.complaint;
     }
@@ -166,7 +168,7 @@ std::string ReadChecked(ReadContext& context)
             complaint = context.report.warnings.front();
         throw std::runtime_error("it holds no geometry" + (complaint.empty() ? "" : ": " + complaint));
     }
-    return Encode(*graph);
+    return EncodeGraph(*graph);
 }
 
 } // namespace

@@ -7,6 +7,7 @@
 #include <osg/TexMat>
 #include <osgDB/ReadFile>
 
+#include "assets/models/ModelGraph.h"
 #include "Preparation.h"
 
 namespace
@@ -180,6 +181,11 @@ osg::ref_ptr<osg::Image> StateBuilder::TakeImage(osg::Image* image)
         return nullptr;
     }
     context.textures.erase(image->getFileName());
+    if (!IsKnownImage(*image))
+    {
+        context.Warn("the texture \"" + image->getFileName() + "\" is of a kind that can't be drawn");
+        return nullptr;
+    }
     osg::ref_ptr<osg::Image>& known = images[image->getFileName()];
     if (known && !image->getFileName().empty())
         return known;

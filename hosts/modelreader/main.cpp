@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
+#include <filesystem>
 #include <new>
 #include <sys/prctl.h>
 #include <sys/resource.h>
@@ -20,7 +21,7 @@
 ///     panoramic-model-reader --report PATH [...]      what there is to say of the model, as text
 ///
 /// Parsers of old formats break down on damaged files; in here that harms nobody. So this program limits what it may
-/// take, leaves no core behind, and goes when its parent goes.
+/// take and do (Confinement.h), leaves no core behind, and goes when its parent goes.
 
 namespace
 {
@@ -62,6 +63,8 @@ bool PrintReport(const std::string& package)
         std::printf("%lld polygons, %lld vertices, %u drawables, %lld bytes of textures\n",
                     static_cast<long long>(report.polygons), static_cast<long long>(report.vertices), report.drawables,
                     static_cast<long long>(report.textureBytes));
+    for (const std::string& note : report.notes)
+        std::printf("note: %s\n", note.c_str());
     for (const std::string& warning : report.warnings)
         std::printf("warning: %s\n", warning.c_str());
     for (const auto& [name, file] : report.parts)
@@ -83,7 +86,10 @@ int main(int count, char** values)
         std::fprintf(stderr, "usage: panoramic-model-reader [--report] PATH [KEY=VALUE ...]\n");
         return 2;
     }
-    const ModelRequest request = ModelRequest::FromArguments(arguments);
+    ModelRequest request = ModelRequest::FromArguments(arguments);
+    request.path = std::filesystem::absolute(request.path).lexically_normal().string();
+    std::filesystem::current_path("/"); // the library loads code from the working directory, too
+    ::close_range(STDERR_FILENO + 1, ~0U, 0);
     ::prctl(PR_SET_PDEATHSIG, SIGKILL);
     SetLimits(request);
 

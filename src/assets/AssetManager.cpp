@@ -1,6 +1,9 @@
 #include "assets/AssetManager.h"
 
 #include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <set>
 #include <sstream>
 #include <sys/stat.h>
@@ -8,8 +11,7 @@
 
 #include <osg/LightModel>
 #include <osgDB/Options>
-#include <osgDB/ReadFile>
-#include <osgDB/Registry>
+#include <osgDB/ReaderWriter>
 #include <osgUtil/Optimizer>
 #include <osgUtil/SmoothingVisitor>
 
@@ -25,8 +27,9 @@
 namespace
 {
 
-constexpr std::uint32_t textModelNotRead = 9001; ///< "The model %1 could not be read: %2"
-constexpr std::uint32_t textModelLosses = 9002;  ///< "The model %1 was read with losses: %2"
+constexpr std::uint32_t textModelNotRead = 9001;  ///< "The model %1 could not be read: %2"
+constexpr std::uint32_t textModelLosses = 9002;   ///< "The model %1 was read with losses: %2"
+constexpr std::uint32_t textLessProtected = 9003; ///< "Models are read with less protection on this machine: %1"
 
 constexpr unsigned optimizations = 0x110F9;
 static_assert(optimizations ==
@@ -43,6 +46,8 @@ static_assert(copyFlags ==
 
 constexpr unsigned tangentLocation = 6;
 constexpr unsigned binormalLocation = 7;
+
+constexpr std::uintmax_t maxShaderBytes = 1 << 20;
 
 /// Models of this library have faces that look the wrong way.
 constexpr const wchar_t* twoSidedLibrary = L"vantor objects\\old(prior gld 2.3)";
@@ -146,6 +151,16 @@ void MakeTwoSided(osg::Node& root)
     state.setAttributeAndModes(lightModel, osg::StateAttribute::ON | osg::StateAttribute::OVERRIDE);
 }
 
+/// The whole of a shader file; empty without one, or for one that is none by its size.
+std::string ReadShaderText(const std::string& path)
+{
+    std::error_code failed;
+    if (!std::filesystem::is_regular_file(path, failed) || std::filesystem::file_size(path, failed) > maxShaderBytes)
+        return {};
+    std::ifstream file(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(file), {}};
+}
+
 /// The number at the start of `text`, 0 without one.
 int LeadingInteger(const std::wstring& text)
 {
@@ -205,12 +220,10 @@ VtCOsgAssetManager::VtCOsgAssetManager(const VtTAssetServices& services)
       customerPath(base::Utf8(services.paths->GetCustomerPath())),
       objectsPath(base::Utf8(services.paths->GetObjectsPath()))
 {
-    reader->Register();
 }
 
 VtCOsgAssetManager::~VtCOsgAssetManager()
 {
-    reader->Unregister();
     models.clear();
     xmlAttributes.clear();
     modelTimes.clear();
@@ -264,13 +277,19 @@ osg::Group* VtCOsgAssetManager::readModel(const std::wstring& path, bool useVrml
     osg::ref_ptr<osg::Group> root = new osg::Group;
     osg::ref_ptr<osgDB::Options> options = makeOptions(useVrmlTransform);
 
-    // As readNodeFile does it, but with the reason of a failure in hand, where that would print it.
-    osgDB::ReaderWriter::ReadResult result = osgDB::Registry::instance()->readNode(nativePath, options);
+    // Not by the library's registry: its plug-ins would parse, or run, whatever a file's ending asks for in here.
+    osgDB::ReaderWriter::ReadResult result = reader->readNode(nativePath, options);
     const osg::ref_ptr<osg::Node> node = result.getNode();
     if (!node)
         messages.ShowError(textModelNotRead, path, base::Wide(result.message()));
     else if (const std::string warnings = options->getPluginStringData("readWarnings"); !warnings.empty())
         messages.ShowWarning(textModelLosses, path, base::Wide(warnings));
+
+    if (const std::string notes = options->getPluginStringData("readNotes"); !notes.empty() && !toldProtection)
+    {
+        messages.Log(textLessProtected, base::Wide(notes));
+        toldProtection = true;
+    }
 
     polygonCount += std::atoi(options->getPluginStringData("polygonCount").c_str());
     vertexCount += std::atoi(options->getPluginStringData("vertexCount").c_str());
@@ -341,9 +360,12 @@ osg::Shader* VtCOsgAssetManager::getShader(const std::wstring& path, osg::Shader
     osg::ref_ptr<osg::Shader>& shader = shaders[path];
     if (!shader)
     {
-        shader = osgDB::readRefShaderFile(base::NativePath(path).string(), osgDB::Registry::instance()->getOptions());
-        if (shader)
-            shader->setType(type);
+        const std::string file = base::NativePath(path).string();
+        if (const std::string source = ReadShaderText(file); !source.empty())
+        {
+            shader = new osg::Shader(type, source);
+            shader->setFileName(file);
+        }
     }
     return shader.get();
 }

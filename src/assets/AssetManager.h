@@ -113,6 +113,7 @@ private:
     std::map<std::wstring, osg::ref_ptr<osg::Shader>> shaders;
     std::vector<std::wstring> noOptimizeFiles; ///< lower-case parts of paths
     std::vector<std::wstring> textureAttributeNames;
+    bool toldProtection = false; ///< that this machine protects less, once is enough
     float maxTexAnisotropy = 8.0f;
     std::int32_t polygonCount = 0;
     std::int32_t vertexCount = 0;

@@ -34,6 +34,7 @@ Json ToJson(const ModelReport& report)
         shaders.push_back({drawable, name});
     return {{"error", report.error},
             {"warnings", report.warnings},
+            {"notes", report.notes},
             {"polygons", report.polygons},
             {"vertices", report.vertices},
             {"textureBytes", report.textureBytes},
@@ -49,6 +50,7 @@ ModelReport FromJson(const Json& json)
     ModelReport report;
     json.at("error").get_to(report.error);
     json.at("warnings").get_to(report.warnings);
+    json.at("notes").get_to(report.notes);
     json.at("polygons").get_to(report.polygons);
     json.at("vertices").get_to(report.vertices);
     json.at("textureBytes").get_to(report.textureBytes);

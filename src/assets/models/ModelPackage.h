@@ -10,13 +10,14 @@
 #include "assets/models/FileStamp.h"
 
 /// Counts with whatever the reading process does; a finished model of another version is read again.
-inline constexpr std::uint32_t modelPackageVersion = 1;
+inline constexpr std::uint32_t modelPackageVersion = 2;
 
 /// What is known of one model that was read, beside its graph.
 struct ModelReport
 {
     std::string error;                 ///< why there is no graph; empty when there is one
     std::vector<std::string> warnings; ///< what was left out or put right, a sentence each
+    std::vector<std::string> notes;    ///< for the log: what the reading process couldn't be kept from
     std::int64_t polygons = 0;
     std::int64_t vertices = 0;
     std::int64_t textureBytes = 0;

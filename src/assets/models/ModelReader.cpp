@@ -8,18 +8,12 @@
 #include <osg/NodeVisitor>
 #include <osg/ProxyNode>
 #include <osg/Version>
-#include <osgDB/FileNameUtils>
-#include <osgDB/Registry>
+#include <osgDB/Options>
 
-#include "assets/models/MemoryStream.h"
+#include "assets/models/ModelGraph.h"
 
 namespace
 {
-
-/// A plug-in of this name doesn't exist: the library looks for it when the reader has failed, and finds nothing.
-const char* const noPlugin = "panoramic_models";
-
-const char* const extensions[] = {"dae", "wrl"};
 
 /// Numbers the drawables of a graph as the reading program does: in visiting order, each once.
 class DrawableList : public osg::NodeVisitor
@@ -40,21 +34,7 @@ private:
     std::unordered_set<osg::Drawable*> seen;
 };
 
-osg::ref_ptr<osg::Group> DecodeGraph(std::string_view bytes)
-{
-    osgDB::ReaderWriter* binary = osgDB::Registry::instance()->getReaderWriterForExtension("osgb");
-    if (!binary)
-        throw std::runtime_error("the scene graph library's plug-in for \"osgb\" is missing");
-    MemoryStream stream(bytes);
-    osgDB::ReaderWriter::ReadResult result = binary->readNode(stream, nullptr);
-    osg::ref_ptr<osg::Group> graph = result.validNode() ? result.getNode()->asGroup() : nullptr;
-    if (!graph)
-        throw std::runtime_error("its reader handed back no graph");
-    return graph;
-}
-
-/// Parts of a group are bodies of their own, so the proxy only names them. It isn't part of the binary form, which
-/// would load its files when it is read.
+/// Parts of a group are bodies of their own, so the proxy only names them.
 void AddParts(osg::Group& graph, const ModelReport& report)
 {
     if (report.parts.empty())
@@ -81,28 +61,13 @@ bool StillHolds(const ModelReport& report)
 VtCModelReader::VtCModelReader(VtTModelReaderSettings readerSettings)
     : settings(std::move(readerSettings)), cache(settings.cacheFolder, settings.cacheBytes)
 {
-    supportsExtension("dae", "COLLADA");
-    supportsExtension("wrl", "VRML");
-}
-
-void VtCModelReader::Register()
-{
-    osgDB::Registry* registry = osgDB::Registry::instance();
-    registry->getReaderWriterList().insert(registry->getReaderWriterList().begin(), this);
-    for (const char* extension : extensions)
-        registry->addFileExtensionAlias(extension, noPlugin);
-}
-
-void VtCModelReader::Unregister()
-{
-    osgDB::Registry::instance()->removeReaderWriter(this);
 }
 
 osgDB::ReaderWriter::ReadResult VtCModelReader::readNode(const std::string& path, const osgDB::Options* options) const
 {
-    if (!acceptsExtension(osgDB::getLowerCaseFileExtension(path)))
-        return ReadResult::FILE_NOT_HANDLED;
     shaderNodes.clear();
+    if (!HasModelFormat(path))
+        return ReadResult(std::string("of models only these formats are read: ") + modelFormats);
     if (FileStamp::Of(path).size < 0)
         return ReadResult("there is no such file");
 
@@ -129,14 +94,19 @@ osgDB::ReaderWriter::ReadResult VtCModelReader::readNode(const std::string& path
 
         if (options)
         {
-            std::string warnings;
-            for (const std::string& warning : report.warnings)
-                warnings += (warnings.empty() ? "" : "; ") + warning;
+            const auto joined = [](const std::vector<std::string>& sentences)
+            {
+                std::string all;
+                for (const std::string& sentence : sentences)
+                    all += (all.empty() ? "" : "; ") + sentence;
+                return all;
+            };
             options->setPluginStringData("polygonCount", std::to_string(report.polygons));
             options->setPluginStringData("vertexCount", std::to_string(report.vertices));
             options->setPluginStringData("textureMemoryUsed", std::to_string(report.textureBytes));
             options->setPluginStringData("xmlAttributes", report.xmlAttributes);
-            options->setPluginStringData("readWarnings", warnings);
+            options->setPluginStringData("readWarnings", joined(report.warnings));
+            options->setPluginStringData("readNotes", joined(report.notes));
             options->setPluginData("shaderNodes", &shaderNodes);
         }
         return graph.get();
@@ -154,7 +124,7 @@ void VtCModelReader::Preload(const std::vector<std::string>& paths, const osgDB:
     for (const std::string& path : paths)
     {
         const ModelRequest request = ModelRequest::Make(path, options);
-        const bool ours = acceptsExtension(osgDB::getLowerCaseFileExtension(path)) && FileStamp::Of(path).size >= 0;
+        const bool ours = HasModelFormat(path) && FileStamp::Of(path).size >= 0;
         if (!ours || std::find(keys.begin(), keys.end(), Key(request)) != keys.end() ||
             preloaded.contains(Key(request)) || !FindFinished(request).empty())
             continue;

@@ -16,22 +16,18 @@ namespace osg
 class Drawable;
 }
 
-/// Reads ".dae" and ".wrl" files for this process without parsing them in it.
+/// Reads model files (`modelFormats`) for this process without parsing them in it.
 ///
 /// A program of its own parses the file, checks every number of what comes out, and hands back the finished graph; so
 /// a damaged file, or one that runs the parser into a hang, costs that program and not this one. Finished models are
 /// kept on disk and taken from there while none of the files they were made from has changed.
 ///
-/// Once one was registered, the library's own readers of these files are never loaded into this process, not even when
-/// a read fails. Options and results are described in docs/models.md. Not thread safe.
+/// Nothing else reads a model: a file of another format is refused by its ending. Options and results are described in
+/// docs/models.md. Not thread safe.
 class VtCModelReader : public osgDB::ReaderWriter
 {
 public:
     explicit VtCModelReader(VtTModelReaderSettings settings);
-
-    /// Puts it before every other reader of the process; `Unregister` takes it out.
-    void Register();
-    void Unregister();
 
     const char* className() const override { return "Panoramic model reader"; }
 

@@ -1,7 +1,9 @@
 #include "assets/models/ModelRequest.h"
 
 #include <filesystem>
+#include <string_view>
 
+#include <osgDB/FileNameUtils>
 #include <osgDB/Options>
 
 #include "base/Numbers.h"
@@ -22,6 +24,14 @@ const Key keys[] = {
 };
 
 } // namespace
+
+bool HasModelFormat(const std::string& path)
+{
+    const std::string ending = osgDB::getLowerCaseFileExtension(path);
+    const std::string_view all = modelFormats;
+    const std::size_t at = ending.empty() ? std::string::npos : all.find("." + ending);
+    return at != std::string::npos && (at + ending.size() + 1 == all.size() || all[at + ending.size() + 1] == ',');
+}
 
 ModelRequest ModelRequest::Make(const std::string& path, const osgDB::Options* options)
 {

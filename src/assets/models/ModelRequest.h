@@ -10,6 +10,12 @@ namespace osgDB
 class Options;
 }
 
+/// The formats that are read, for messages.
+inline constexpr const char* modelFormats = ".dae, .wrl, .obj, .stl, .ply, .3ds, .osgt, .osgb";
+
+/// Whether the file `path` is of one of them, by its ending in any case.
+bool HasModelFormat(const std::string& path);
+
 /// One model to be read and how: the path, and the reader's options under their keys.
 ///
 /// It goes to the reading process as command line arguments, and its text is what a finished model is kept under.

@@ -1,4 +1,4 @@
-#include "GeometryCheck.h"
+#include "assets/models/GeometryCheck.h"
 
 #include <cmath>
 
@@ -30,10 +30,25 @@ void Mend(osg::Array* array, const typename Array::ElementDataType& instead)
                 value = instead;
 }
 
+/// The kinds of arrays that are handed on.
+bool IsKnownKind(const osg::Array& array)
+{
+    switch (array.getType())
+    {
+    case osg::Array::Vec2ArrayType:
+    case osg::Array::Vec3ArrayType:
+    case osg::Array::Vec4ArrayType:
+    case osg::Array::Vec4ubArrayType:
+        return true;
+    default:
+        return false;
+    }
+}
+
 /// An array that is there for nothing, or for fewer vertices than there are, is worse than none.
 bool Fits(const osg::Array* array, unsigned vertices, unsigned primitiveSets)
 {
-    if (!array)
+    if (!array || !IsKnownKind(*array))
         return false;
     switch (array->getBinding())
     {
@@ -155,7 +170,9 @@ std::string CheckGeometry(osg::Geometry& geometry)
     {
         Mend<osg::Vec2Array>(geometry.getTexCoordArray(unit), osg::Vec2());
         Mend<osg::Vec3Array>(geometry.getTexCoordArray(unit), osg::Vec3());
-        if (!Fits(geometry.getTexCoordArray(unit), vertices, primitiveSets))
+        // Taken as one for each vertex by what draws, whatever it says.
+        if (!Fits(geometry.getTexCoordArray(unit), vertices, primitiveSets) ||
+            geometry.getTexCoordArray(unit)->getNumElements() != vertices)
             geometry.setTexCoordArray(unit, nullptr);
     }
     geometry.setSecondaryColorArray(nullptr);
