@@ -7,12 +7,14 @@
 #include <fmt/format.h>
 #include <nlohmann/json.hpp>
 
+#include "app/PanoramicApp.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/console/Command.h"
 #include "hosts/console/ConsoleHost.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "interaction/FollowMode.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "scene/StoredModel.h"
@@ -63,7 +65,6 @@ struct SceneInfo
 };
 
 constexpr std::uint32_t textFollowModes = 6221;
-constexpr const wchar_t* notConnected = L"Not connected";
 
 std::string TypeName(std::int32_t type)
 {
@@ -75,15 +76,15 @@ std::string TypeName(std::int32_t type)
 }
 
 template <class Value>
-Value ValueOf(const VtISceneObject& record, const wchar_t* attribute, Value otherwise)
+Value ValueOf(const VtISceneObject& record, std::wstring_view name, Value otherwise)
 {
-    const auto* value = record.Find<Value>(attribute);
+    const auto* value = record.Find<Value>(name);
     return value ? *value : otherwise;
 }
 
-std::string TextOf(const VtISceneObject& record, const wchar_t* attribute)
+std::string TextOf(const VtISceneObject& record, std::wstring_view name)
 {
-    return base::Utf8(ValueOf(record, attribute, std::wstring()));
+    return base::Utf8(ValueOf(record, name, std::wstring()));
 }
 
 class Collector
@@ -102,7 +103,7 @@ public:
         switch (record.GetObjectType())
         {
         case objectTypeMovableBody:
-            bodies.push_back(base::ToLower(ValueOf(record, L"name", std::wstring())));
+            bodies.push_back(base::ToLower(ValueOf(record, attribute::name, std::wstring())));
             [[fallthrough]];
         case objectTypeStaticBody:
             AddModel(record);
@@ -112,11 +113,11 @@ public:
             AddObserver(record);
             break;
         case objectTypeView:
-            info.views.push_back(
-                {ValueOf(record, L"view_pos", std::int32_t{0}), TextOf(record, L"name"), TextOf(record, L"observer")});
+            info.views.push_back({ValueOf(record, attribute::viewPos, std::int32_t{0}), TextOf(record, attribute::name),
+                                  TextOf(record, attribute::observer)});
             break;
         case objectTypeWindowLayout:
-            info.splitter = ValueOf(record, L"splitter_position", std::vector<float>());
+            info.splitter = ValueOf(record, attribute::splitterPosition, std::vector<float>());
             break;
         default:
             break;
@@ -137,21 +138,21 @@ public:
 private:
     void AddModel(const VtISceneObject& record)
     {
-        const std::wstring stored = ValueOf(record, L"file_path", std::wstring());
+        const std::wstring stored = ValueOf(record, attribute::filePath, std::wstring());
         const std::wstring path = FindStoredModel(stored, file, host.GetLibraryPaths());
-        info.models.push_back({TextOf(record, L"name"), base::NativePath(path).string(), IsModelFile(path)});
+        info.models.push_back({TextOf(record, attribute::name), base::NativePath(path).string(), IsModelFile(path)});
     }
 
     void AddObserver(const VtISceneObject& record)
     {
         const bool isDefault = record.GetObjectType() == objectTypeDefaultObserver;
         ObserverUse use;
-        use.name = isDefault ? TextOf(record, L"internal_id") : TextOf(record, L"name");
-        use.mode = ValueOf(record, L"behaviour", std::int32_t{isDefault ? followFree : followFixed});
+        use.name = isDefault ? TextOf(record, attribute::internalId) : TextOf(record, attribute::name);
+        use.mode = ValueOf(record, attribute::behaviour, std::int32_t{isDefault ? followFree : followFixed});
         if (use.mode >= 0 && static_cast<std::size_t>(use.mode) < modeNames.size())
             use.modeName = base::Utf8(modeNames[static_cast<std::size_t>(use.mode)]);
-        const std::wstring body = ValueOf(record, L"attached_to", std::wstring(notConnected));
-        if (body != notConnected)
+        const std::wstring body = ValueOf(record, attribute::attachedTo, std::wstring(attribute::notConnected));
+        if (body != attribute::notConnected)
             use.body = base::Utf8(body);
         info.observers.push_back(std::move(use));
     }
@@ -213,6 +214,7 @@ int Run(const InfoArguments& arguments)
 {
     ConsoleHost host(false);
     const std::wstring path = base::InnerPath(std::filesystem::absolute(arguments.file).lexically_normal());
+    RegisterAllAttributes();
     VtCSceneObjectStore store;
     const auto records = store.ReadFile(path, {});
     if (!store.GetFileError().empty())

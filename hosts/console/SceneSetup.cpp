@@ -13,6 +13,7 @@
 #include "hosts/common/MotionDataFile.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/Session.h"
+#include "records/AttributeNames.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"
@@ -63,8 +64,8 @@ void BuildStatic(Session& session, VtCPanoramicDocument& document, const StaticA
                                      ModelPath(session, argument.model), osg::Matrixd(), true, {});
     if (const osg::ref_ptr<VtISceneObject> record = body->GetAttributeObject())
     {
-        record->Write(L"position", Floats(argument.position));
-        record->Write(L"rotation", Floats(argument.rotation));
+        record->Write(attribute::position, Floats(argument.position));
+        record->Write(attribute::rotation, Floats(argument.rotation));
     }
     body->AssignShaders();
 }
@@ -180,9 +181,8 @@ bool BindChannels(Session& session, VtCPanoramicDocument& document, const std::v
             continue;
         }
         const auto index = static_cast<std::int32_t>(found - channels.poses.begin());
-        // The crosswise name is right: this attribute holds the index.
         if (const osg::ref_ptr<VtISceneObject> record = bodies[i]->GetAttributeObject())
-            record->Write(L"simulation_data_stream", index);
+            record->Write(attribute::channelIndex, index);
     }
     if (!complete)
         session.GetHost().ShowInformation(messageChannelsAre, Joined(channels.poses));

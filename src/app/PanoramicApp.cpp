@@ -16,6 +16,7 @@
 #include "host/Messages.h"
 #include "host/Progress.h"
 #include "host/Storage.h"
+#include "interaction/Observers.h"
 #include "records/SceneObjectStore.h"
 #include "render/ChildFrame.h"
 #include "render/ViewCommandsHandler.h"
@@ -49,6 +50,14 @@ constexpr const wchar_t* sceneExtension = L".xml";
 VtCPanoramicApp::VtCPanoramicApp(host::Host& programAround)
     : host(programAround), messageHandler(applicationName), cycle(programAround.GetClock(), *this)
 {
+    RegisterAllAttributes();
+}
+
+void RegisterAllAttributes()
+{
+    RegisterSceneAttributes();
+    RegisterInteractionAttributes();
+    RegisterViewAttributes();
 }
 
 VtCPanoramicApp::~VtCPanoramicApp() = default;

@@ -179,3 +179,7 @@ private:
     bool multisampling = false;
     std::uint32_t mouseSensitivity = 5;
 };
+
+/// Tells the attributes of all classes, so that records of theirs can be made and read. The application object does it;
+/// who reads records without one does it by himself.
+void RegisterAllAttributes();

@@ -11,10 +11,11 @@
 #include "base/Text.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/Observers.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
-#include "scene/EulerAngles.h"
 #include "scene/MovableBody.h"
+#include "scene/Placement.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
 
@@ -22,18 +23,12 @@ namespace
 {
 
 constexpr double quarterTurn = 1.5707963267948966;
-const std::wstring notConnectedText = L"Not connected";
 const std::wstring fixedToBodyName = L"Fixed_to_Body";
 const std::wstring fixedToObjectName = L"Fixed_to_Object";
 
 const osg::Vec3d xAxis(1, 0, 0);
 const osg::Vec3d yAxis(0, 1, 0);
 const osg::Vec3d zAxis(0, 0, 1);
-
-VtTFloatTupel3 Tupel(const osg::Vec3f& vector)
-{
-    return {vector.x(), vector.y(), vector.z()};
-}
 
 // The turn about the vertical from the x axis into `direction`; none when that has no horizontal part.
 osg::Quat HeadTurn(const osg::Vec3d& direction)
@@ -43,11 +38,6 @@ osg::Quat HeadTurn(const osg::Vec3d& direction)
     if (heading.normalize() > 0)
         turn.makeRotate(xAxis, heading);
     return turn;
-}
-
-osg::Vec3f Vector(const VtTFloatTupel3& tupel)
-{
-    return {tupel[0], tupel[1], tupel[2]};
 }
 
 // The record's angles turn about axes that turn with each step: y, then the turned z, then the turned x.
@@ -66,20 +56,24 @@ VtTFloatTupel3 RecordFromCameraRotation(const osg::Quat& cameraRotation)
     return {angles.y(), 90.0f - angles.x(), angles.z() + 90.0f};
 }
 
+// From the rotation of the free view, against which the camera is turned by a quarter.
+VtTFloatTupel3 RecordFromOrientation(const osg::Quat& orientation)
+{
+    return RecordFromCameraRotation(osg::Quat(-quarterTurn, xAxis) * orientation * osg::Quat(quarterTurn, xAxis));
+}
+
 } // namespace
 
 VtC3DObserver::VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection,
                              const std::wstring& name, bool inTree, bool freeByBirth, const std::wstring& id)
     : VtC3DBody(owningDocument, &parentCollection, name, {}, inTree, freeByBirth ? name : id),
       collection(parentCollection),
-      isFree(freeByBirth),
+      isFreeByBirth(freeByBirth),
       followModeName(parentCollection.GetFollowModeName(followFixed)),
       follower(parentCollection.GetClock())
 {
     Place({offsetTranslation, osg::Quat()});
-    MakeRecord(freeByBirth);
-    if (freeByBirth)
-        ReadFirstPlacement();
+    MakeRecord();
     PublishAttributes();
 }
 
@@ -89,25 +83,66 @@ VtC3DObserver::~VtC3DObserver()
         connectedBody->Release();
 }
 
-void VtC3DObserver::MakeRecord(bool freeByBirth)
+void VtC3DObserver::MakeRecord()
 {
-    attributeObject = MakeDefaultObject(freeByBirth ? objectTypeDefaultObserver : objectTypeObserver);
-    WriteAttribute(L"internal_id", GetInternalId());
-    WriteAttribute(L"name", GetName());
-    AddMissingAttribute(L"floatTupel3", L"0 0 0", L"position");
-    AddMissingAttribute(L"floatTupel3", L"0 0 0", L"orientation");
-    WriteAttribute(L"translation", Tupel(offsetTranslation));
-    WriteAttribute(L"rotation", Tupel(offsetAngles));
+    attributeObject = GetAttributeTable().MakeRecord();
+    WriteAttribute(attribute::internalId, GetInternalId());
+    for (const std::wstring_view name : {attribute::name, attribute::translation, attribute::rotation})
+        WriteBack(name);
+    if (!isFreeByBirth)
+        return;
+    for (const std::wstring_view name : {attribute::position, attribute::orientation})
+        GetAttributeTable().Take(*this, name, attributeObject->GetAttribute(name)->GetValue());
 }
 
-void VtC3DObserver::ReadFirstPlacement()
+VtTAttributeRows VtC3DObserver::Rows(bool freeByBirth)
 {
-    if (!attributeObject)
-        return;
-    if (const auto* eye = attributeObject->Find<VtTFloatTupel3>(L"position"))
-        setPosition(Vector(*eye), true);
-    if (const auto* angles = attributeObject->Find<VtTFloatTupel3>(L"orientation"))
-        setRotation(RotationFromRecord(*angles), true);
+    using Self = VtC3DObserver;
+    const VtTFloatTupel3 none{0, 0, 0};
+    VtTAttributeRows rows = {
+        // The mode first: whether the observer is free decides how the rest is taken.
+        Attribute<Self>(
+            attribute::behaviour, std::int32_t{freeByBirth ? followFree : followFixed},
+            [](Self& self, std::int32_t mode) { self.ChangeFollowMode(mode, self.collection.GetFollowModeName(mode)); },
+            &Self::followMode,
+            "0 free, 1 fixed, 2 on a body, 3 its heading, 4 smooth, 5 looks at it, 6 its position, 7 its x, 8 its y"),
+        Attribute<Self>(attribute::attachedTo, attribute::notConnected, &Self::TakeAttachedTo, &Self::GiveAttachedTo,
+                        "name of a movable body"),
+        Attribute<Self>(attribute::position, none, &Self::TakePosition, &Self::GivePosition,
+                        "of a free observer: scene axes, metres"),
+        Attribute<Self>(attribute::orientation, none, &Self::TakeOrientation, &Self::GiveOrientation,
+                        "of a free observer: degrees about y, the turned z, the turned x"),
+        Attribute<Self>(
+            attribute::translation, none, &Self::TakeTranslation,
+            [](const Self& self) { return TupelOf(self.offsetTranslation); }, "body axes or scene axes, metres"),
+        Attribute<Self>(
+            attribute::rotation, none, &Self::TakeRotation, [](const Self& self) { return TupelOf(self.offsetAngles); },
+            "of the view, degrees about x, y, z"),
+    };
+    if (!freeByBirth)
+        rows.push_back(KeptAttribute(attribute::cloned, false, "1: made by a track").Optional());
+    return rows;
+}
+
+const VtCAttributeTable& VtC3DObserver::Attributes(bool freeByBirth)
+{
+    const auto name = []
+    {
+        return Attribute<VtC3DObserver>(attribute::name, L"", &VtC3DObserver::TakeName, &VtC3DObserver::GetName,
+                                        "as the tree shows it");
+    };
+    static const VtCAttributeTable defaults(objectTypeDefaultObserver,
+                                            {IdentityRows(objectTypeDefaultObserver, name()), Rows(true)},
+                                            VtCAttributeTable::Names::anyCase);
+    static const VtCAttributeTable others(objectTypeObserver, {IdentityRows(objectTypeObserver, name()), Rows(false)},
+                                          VtCAttributeTable::Names::anyCase);
+    return freeByBirth ? defaults : others;
+}
+
+void RegisterInteractionAttributes()
+{
+    RegisterAttributeTable(VtC3DObserver::Attributes(true));
+    RegisterAttributeTable(VtC3DObserver::Attributes(false));
 }
 
 void VtC3DObserver::Update()
@@ -213,12 +248,39 @@ void VtC3DObserver::setPosition(const osg::Vec3f& eye, bool update)
 {
     position = eye;
     RebuildFreeView(update);
+    WriteAttribute(attribute::position, TupelOf(eye));
 }
 
 void VtC3DObserver::setRotation(const osg::Quat& newOrientation, bool update)
 {
     orientation = newOrientation;
     RebuildFreeView(update);
+    WriteAttribute(attribute::orientation, RecordFromOrientation(orientation));
+}
+
+void VtC3DObserver::TakePosition(const VtTFloatTupel3& eye)
+{
+    position = VectorOf(eye);
+    RebuildFreeView(true);
+    if (collection.GetInteraction().GetActiveObserver() == this)
+        collection.GetInteraction().SetHeadLightPosition(position);
+}
+
+void VtC3DObserver::TakeOrientation(const VtTFloatTupel3& angles)
+{
+    orientation = RotationFromRecord(angles);
+    RebuildFreeView(true);
+}
+
+// The rules of the other modes place the eye in every frame, and that isn't stored.
+std::optional<VtTFloatTupel3> VtC3DObserver::GivePosition() const
+{
+    return IsFree() ? std::optional(TupelOf(position)) : std::nullopt;
+}
+
+std::optional<VtTFloatTupel3> VtC3DObserver::GiveOrientation() const
+{
+    return IsFree() ? std::optional(RecordFromOrientation(orientation)) : std::nullopt;
 }
 
 void VtC3DObserver::RebuildFreeView(bool update)
@@ -238,11 +300,11 @@ void VtC3DObserver::setMatrix(const osg::Matrixd& matrix, bool update)
 
 void VtC3DObserver::StoreFreeView(const osg::Vec3f& eye, const osg::Quat& cameraRotation)
 {
-    WriteAttribute(L"position", Tupel(eye));
-    setPosition(eye, false);
-    WriteAttribute(L"orientation", RecordFromCameraRotation(cameraRotation));
-    setRotation(osg::Quat(quarterTurn, xAxis) * cameraRotation * osg::Quat(-quarterTurn, xAxis), false);
-    SetModified();
+    position = eye;
+    orientation = osg::Quat(quarterTurn, xAxis) * cameraRotation * osg::Quat(-quarterTurn, xAxis);
+    RebuildFreeView(false);
+    WriteAttribute(attribute::position, TupelOf(eye));
+    WriteAttribute(attribute::orientation, RecordFromCameraRotation(cameraRotation));
 }
 
 void VtC3DObserver::PushViewMatrix()
@@ -271,26 +333,42 @@ bool VtC3DObserver::HasCamera(const osg::Camera* camera) const
 
 void VtC3DObserver::SetName(const std::wstring& name)
 {
+    TakeName(name);
+    WriteBack(attribute::name);
+}
+
+void VtC3DObserver::TakeName(const std::wstring& name)
+{
     SetDisplayName(name);
     SetObjectName(name);
-    SetModified();
 }
 
 void VtC3DObserver::SetFollowMode(const std::wstring& name)
 {
-    followModeName = base::EqualsNoCase(name, fixedToBodyName) ? fixedToObjectName : name;
-    followMode = collection.GetFollowModeIndex(followModeName);
-    SetModified();
+    const std::wstring& known = base::EqualsNoCase(name, fixedToBodyName) ? fixedToObjectName : name;
+    ChangeFollowMode(collection.GetFollowModeIndex(known), known);
+    WriteBack(attribute::behaviour);
 }
 
 void VtC3DObserver::SetFollowModeIndex(std::int32_t index)
 {
+    ChangeFollowMode(index, collection.GetFollowModeName(index));
+    WriteBack(attribute::behaviour);
+}
+
+void VtC3DObserver::ChangeFollowMode(std::int32_t index, const std::wstring& name)
+{
     followMode = index;
-    followModeName = collection.GetFollowModeName(index);
-    SetModified();
+    followModeName = name;
 }
 
 void VtC3DObserver::SetConnectedBody(VtC3DMovableBody* body)
+{
+    HoldBody(body);
+    WriteBack(attribute::attachedTo);
+}
+
+void VtC3DObserver::HoldBody(VtC3DMovableBody* body)
 {
     if (body)
         body->AddRef();
@@ -298,29 +376,32 @@ void VtC3DObserver::SetConnectedBody(VtC3DMovableBody* body)
         connectedBody->Release();
     connectedBody = body;
     connectedBodyName.clear();
-    SetModified();
-}
-
-void VtC3DObserver::Disconnect()
-{
-    SetConnectedBody(nullptr);
-    WriteAttribute(L"attached_to", notConnectedText);
 }
 
 void VtC3DObserver::SetTranslationOffset(const osg::Vec3f& offset)
 {
-    offsetTranslation = offset;
-    SetModified();
+    TakeTranslation(TupelOf(offset));
+    WriteBack(attribute::translation);
+}
+
+void VtC3DObserver::TakeTranslation(const VtTFloatTupel3& offset)
+{
+    offsetTranslation = VectorOf(offset);
     PushViewMatrix();
 }
 
 void VtC3DObserver::SetRotationOffset(const osg::Vec3f& angles)
 {
-    offsetAngles = angles;
-    offsetRotation = osg::Quat(base::RadiansFromDegrees(angles.z()), zAxis) *
-                     osg::Quat(base::RadiansFromDegrees(angles.y()), yAxis) *
-                     osg::Quat(base::RadiansFromDegrees(angles.x()), xAxis);
-    SetModified();
+    TakeRotation(TupelOf(angles));
+    WriteBack(attribute::rotation);
+}
+
+void VtC3DObserver::TakeRotation(const VtTFloatTupel3& angles)
+{
+    offsetAngles = VectorOf(angles);
+    offsetRotation = osg::Quat(base::RadiansFromDegrees(angles[2]), zAxis) *
+                     osg::Quat(base::RadiansFromDegrees(angles[1]), yAxis) *
+                     osg::Quat(base::RadiansFromDegrees(angles[0]), xAxis);
     PushViewMatrix();
 }
 
@@ -339,57 +420,29 @@ bool VtC3DObserver::IsValidConfiguration() const
 void VtC3DObserver::ApplyAttributes(VtISceneObject& source)
 {
     if (!collection.IsFreeObserver(*this))
-        for (const wchar_t* name : {L"position", L"orientation"})
+        for (const std::wstring_view name : {attribute::position, attribute::orientation})
             if (!source.GetAttribute(name))
-                source.AddAttribute(L"floatTupel3", L"0 0 0", name);
+                source.AddAttribute(name, VtTFloatTupel3{0, 0, 0});
     VtC3DBody::ApplyAttributes(source);
 }
 
-void VtC3DObserver::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                                       const VtTAttributeValue& value)
-{
-    const std::wstring name = base::ToLower(attributeName);
-    const auto* tupel = std::get_if<VtTFloatTupel3>(&value);
-    const auto* number = std::get_if<std::int32_t>(&value);
-    const auto* text = std::get_if<std::wstring>(&value);
-
-    if (name == L"behaviour" && number)
-    {
-        SetFollowModeIndex(*number);
-        isFree = *number == followFree;
-    }
-    else if (name == L"attached_to" && text)
-        OnAttachedTo(*text);
-    else if (name == L"translation" && tupel)
-        SetTranslationOffset(Vector(*tupel));
-    else if (name == L"rotation" && tupel)
-        SetRotationOffset(Vector(*tupel));
-    else if (name == L"position" && tupel)
-    {
-        setPosition(Vector(*tupel), true);
-        if (collection.GetInteraction().GetActiveObserver() == this)
-            collection.GetInteraction().SetHeadLightPosition(position);
-        SetModified();
-    }
-    else if (name == L"orientation" && tupel)
-    {
-        setRotation(RotationFromRecord(*tupel), true);
-        SetModified();
-    }
-    else if (name == L"name" && text)
-        SetName(*text);
-    else
-        VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
-}
-
-void VtC3DObserver::OnAttachedTo(const std::wstring& name)
+void VtC3DObserver::TakeAttachedTo(const std::wstring& name)
 {
     const VtCScene3D* scene = GetDocument().GetScene();
-    if (VtC3DMovableBody* body = scene ? scene->FindMovableByName(name) : nullptr)
-        SetConnectedBody(body);
-    else if (!connectedBody)
-        // Kept so that the user can be asked which body takes the place of the missing one.
-        connectedBodyName = base::EqualsNoCase(name, notConnectedText) ? std::wstring() : name;
+    if (name.empty() || base::EqualsNoCase(name, attribute::notConnected))
+        HoldBody(nullptr);
+    else if (VtC3DMovableBody* body = scene ? scene->FindMovableByName(name) : nullptr)
+        HoldBody(body);
+    else if (connectedBody)
+        WriteBack(attribute::attachedTo); // an unknown name changes nothing
+    else
+        connectedBodyName = name; // kept so that the user can be asked which body takes the place of the missing one
+}
+
+std::wstring VtC3DObserver::GiveAttachedTo() const
+{
+    const std::wstring body = GetConnectedBodyName();
+    return body.empty() ? std::wstring(attribute::notConnected) : body;
 }
 
 void VtC3DObserver::ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key,
@@ -420,16 +473,12 @@ int VtC3DObserver::LoadSettings(const std::wstring& section, const VtISettingsRe
     const int status = reader.ReadText(section, L"ConnectedBody", text);
     const VtCScene3D* scene = GetDocument().GetScene();
     const bool bodiesKnown = status == VtISettingsReader::found && scene && scene->GetMovableBodies(0);
-    SetConnectedBody(bodiesKnown ? scene->FindMovableByName(text) : nullptr);
+    HoldBody(bodiesKnown ? scene->FindMovableByName(text) : nullptr);
     if (bodiesKnown && !connectedBody)
         connectedBodyName = text;
+    WriteBack(attribute::attachedTo);
     SetRotationOffset(osg::Vec3f(offsetAngles));
-
-    WriteAttribute(L"name", GetName());
-    WriteAttribute(L"rotation", Tupel(offsetAngles));
-    WriteAttribute(L"translation", Tupel(offsetTranslation));
-    WriteAttribute(L"attached_to", GetConnectedBodyName());
-    WriteAttribute(L"behaviour", followMode);
+    SetTranslationOffset(osg::Vec3f(offsetTranslation));
     return status;
 }
 

@@ -39,6 +39,8 @@ public:
 
     // Placement of a free observer.
 
+    // Each of them writes the record, too.
+
     /// Sets the eye; the free view is rebuilt, and pushed to the cameras with `update`.
     void setPosition(const osg::Vec3f& eye, bool update);
 
@@ -65,7 +67,7 @@ public:
     void SetAssigned(bool flag) { assigned = flag; }
     bool IsAssigned() const { return assigned; }
 
-    // What the user sets. Each marks the document as changed.
+    // What the user sets. Each writes the record.
 
     void SetName(const std::wstring& name);
 
@@ -76,8 +78,8 @@ public:
     /// The followed body, null for none. It lives on as long as it is followed, even when the scene has let it go.
     void SetConnectedBody(VtC3DMovableBody* body);
 
-    /// The body goes: no target from then on, and the record says so.
-    void Disconnect();
+    /// The body goes: no target from then on.
+    void Disconnect() { SetConnectedBody(nullptr); }
 
     void SetTranslationOffset(const osg::Vec3f& offset);
 
@@ -95,8 +97,7 @@ public:
     std::wstring GetConnectedBodyName() const;
 
     /// The mouse drives it.
-    bool IsFree() const { return isFree; }
-    void SetFree(bool flag) { isFree = flag; }
+    bool IsFree() const { return followMode == followFree; }
 
     bool NeedsBody() const { return FollowModeNeedsBody(followMode); }
 
@@ -110,8 +111,9 @@ public:
     void FinishLoad(const std::wstring& id) { RebindAttributes(id); }
 
     void ApplyAttributes(VtISceneObject& source) override;
-    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                            const VtTAttributeValue& value) override;
+    /// What the record of a free observer (type 9), or of any other, holds. Names in any case.
+    static const VtCAttributeTable& Attributes(bool freeByBirth);
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(isFreeByBirth); }
 
     /// Reads the keys of a section; the status of the last of them. Nothing changes when there is no "Name".
     int LoadSettings(const std::wstring& section, const VtISettingsReader& reader);
@@ -127,20 +129,30 @@ private:
         osg::Quat rotation;
     };
 
-    void MakeRecord(bool freeByBirth);
-    void ReadFirstPlacement();
+    static VtTAttributeRows Rows(bool freeByBirth);
+    void MakeRecord();
     Placement FollowRigid(const osg::Matrixd& body) const;
     Placement FollowHeading(const osg::Matrixd& body) const;
     Placement LookAt(const osg::Matrixd& body) const;
     void Place(const Placement& placement);
     const osg::Quat& CameraAxes(const osg::Vec3f& angles);
     void RebuildFreeView(bool update);
-    void OnAttachedTo(const std::wstring& name);
+    void HoldBody(VtC3DMovableBody* body);
+    void ChangeFollowMode(std::int32_t index, const std::wstring& name);
+    void TakeName(const std::wstring& name);
+    void TakeAttachedTo(const std::wstring& name);
+    void TakeTranslation(const VtTFloatTupel3& offset);
+    void TakeRotation(const VtTFloatTupel3& angles);
+    void TakePosition(const VtTFloatTupel3& eye);
+    void TakeOrientation(const VtTFloatTupel3& angles);
+    std::wstring GiveAttachedTo() const;
+    std::optional<VtTFloatTupel3> GivePosition() const;
+    std::optional<VtTFloatTupel3> GiveOrientation() const;
     void ReadNumber(const VtISettingsReader& reader, const std::wstring& section, const wchar_t* key, float& number);
 
     VtC3DObservers& collection;
+    const bool isFreeByBirth;
     bool assigned = false;
-    bool isFree = false;
     osg::Vec3f offsetAngles; ///< degrees about x, y, z
     osg::Vec3f offsetTranslation{0, 0, 1.5f};
     std::optional<osg::Quat> cameraAxes; ///< those of the camera, for `axesAngles`

@@ -8,7 +8,6 @@
 #include "host/Messages.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/Observer.h"
-#include "scene/EulerAngles.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
@@ -176,8 +175,6 @@ void VtC3DObservers::SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody
         if (std::find(missing.observers.begin(), missing.observers.end(), observer) == missing.observers.end())
             continue;
         observer->SetConnectedBody(&body);
-        if (const osg::ref_ptr<VtISceneObject> record = observer->GetAttributeObject())
-            record->Write(L"attached_to", body.GetName());
     }
 }
 
@@ -208,16 +205,12 @@ void VtC3DObservers::LoadFreeObserver(VtC3DObserver* observer, int number, const
         return;
     const std::wstring section = L"Scene Settings";
     const std::wstring suffix = L"FreeObserver" + std::to_wstring(number);
-    const osg::ref_ptr<VtISceneObject> record = observer->GetAttributeObject();
     std::wstring text;
 
     if (reader.ReadText(section, L"LastPosition" + suffix, text) == VtISettingsReader::found)
     {
         const std::array<double, 3> eye = Numbers<3>(text);
-        const osg::Vec3f position(osg::Vec3d(eye[0], eye[1], eye[2]));
-        observer->setPosition(position, true);
-        if (record)
-            record->Write(L"position", VtTFloatTupel3{position.x(), position.y(), position.z()});
+        observer->setPosition(osg::Vec3f(osg::Vec3d(eye[0], eye[1], eye[2])), true);
     }
     if (reader.ReadText(section, L"LastOrientation" + suffix, text) == VtISettingsReader::found)
     {
@@ -301,11 +294,6 @@ void VtC3DObservers::GenerateDefaultObservers(const std::wstring& movables)
             if (observer->IsValidConfiguration())
                 continue;
             observer->SetConnectedBody(body);
-            if (const osg::ref_ptr<VtISceneObject> record = observer->GetAttributeObject())
-            {
-                record->Write(L"attached_to", body->GetName());
-                record->Write(L"name", observer->GetName());
-            }
         }
     }
 }

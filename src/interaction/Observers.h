@@ -98,3 +98,6 @@ private:
     VtC3DObserver* free2 = nullptr;
     std::vector<std::wstring> followModeNames;
 };
+
+/// Tells the tables of this folder: observers.
+void RegisterInteractionAttributes();

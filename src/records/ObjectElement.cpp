@@ -1,4 +1,5 @@
 #include "records/ObjectElement.h"
+#include "records/AttributeNames.h"
 
 #include "base/Numbers.h"
 #include "base/Text.h"
@@ -239,14 +240,14 @@ osg::ref_ptr<VtISceneObject> VtCObjectReader::Read(const pugi::xml_node& element
 
     if (isWhole && object->GetAttributes().empty())
         RefuseNode(element, "the object has no attributes");
-    const std::int32_t* stored = object->Find<std::int32_t>(L"object_type");
+    const std::int32_t* stored = object->Find<std::int32_t>(attribute::objectType);
     if (type && stored && *type != *stored)
         RefuseNode(element, "the type of the object is " + std::to_string(*type) + ", but its object_type is " +
                                 std::to_string(*stored));
     if (!type && !stored && isWhole)
         RefuseNode(element, "the object has no type");
     object->SetObjectType(type ? *type : stored ? *stored : std::int32_t{objectTypeStaticBody});
-    object->Write(L"object_type", object->GetObjectType());
+    object->Write(attribute::objectType, object->GetObjectType());
     return object;
 }
 

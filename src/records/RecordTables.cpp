@@ -1,205 +1,124 @@
 #include "records/RecordTables.h"
 
-#include <array>
+#include <algorithm>
+#include <stdexcept>
 #include <string>
 #include <unordered_map>
+
+#include "base/Text.h"
+#include "records/AttributeNames.h"
 
 namespace
 {
 
-using Type = VtEAttributeType;
-
-// One name has one type in all records.
-const std::unordered_map<std::wstring_view, Type>& FixedTypes()
+std::size_t FixedLength(const VtTAttributeValue& value)
 {
-    static const std::unordered_map<std::wstring_view, Type> types = {
-        {L"object_type", Type::integer},
-        {L"internal_id", Type::text},
-        {L"name", Type::text},
-        // bodies
-        {L"file_path", Type::text},
-        {L"position", Type::floatTupel3},
-        {L"rotation", Type::floatTupel3},
-        {L"scale", Type::floatTupel3},
-        {L"scale_orient", Type::floatTupel3},
-        {L"center", Type::floatTupel3},
-        {L"simulation_data_index", Type::text},
-        {L"simulation_data_stream", Type::integer},
-        {L"last_transform_matrix", Type::floatList},
-        {L"insert_transform_matrix", Type::floatList},
-        {L"visible", Type::integer},
-        {L"selectable", Type::integer},
-        {L"fixed_to_world", Type::integer},
-        {L"transparency", Type::real},
-        {L"render_mode", Type::integer},
-        {L"dye_enabled", Type::integer},
-        {L"dye_color", Type::intTupel3},
-        {L"is_grouped", Type::integer},
-        {L"child_count", Type::integer},
-        {L"child_ids", Type::textList},
-        {L"parent_group_id", Type::text},
-        {L"parent_object_id", Type::text},
-        {L"cloned_from", Type::text},
-        {L"track_id", Type::integer},
-        {L"basetexture", Type::text},
-        {L"decalMap", Type::text},
-        {L"batterTexture", Type::text},
-        {L"roadSurfaceTexture", Type::text},
-        {L"roadFrictionMapTexture", Type::text},
-        {L"roadSurfaceTexX", Type::text},
-        {L"roadSurfaceTexY", Type::text},
-        // observers
-        {L"behaviour", Type::integer},
-        {L"attached_to", Type::text},
-        {L"orientation", Type::floatTupel3},
-        {L"translation", Type::floatTupel3},
-        {L"cloned", Type::integer},
-        // tracks
-        {L"mdf_file", Type::text},
-        {L"time_offset", Type::real},
-        {L"play_loop", Type::integer},
-        {L"data_source", Type::integer},
-        {L"auto_update", Type::integer},
-        {L"active", Type::integer},
-        {L"buffer_empty", Type::integer},
-        // views, window layout and render settings
-        {L"observer", Type::text},
-        {L"track", Type::integer},
-        {L"view_angle", Type::real},
-        {L"front_clip_plane", Type::real},
-        {L"back_clip_plane", Type::real},
-        {L"view_pos", Type::integer},
-        {L"splitter_position", Type::floatList},
-        {L"global_render_mode", Type::integer},
-    };
-    return types;
+    const auto* list = std::get_if<std::vector<float>>(&value);
+    return list ? list->size() : 0;
 }
 
-struct PartAttribute
+// Nothing is made from records of tracks yet. They are kept with these types, in whatever order a file has them.
+const VtCAttributeTable& TrackTable()
 {
-    std::wstring_view suffix;
-    Type type;
+    static const VtCAttributeTable table(
+        objectTypeTrack, {IdentityRows(objectTypeTrack, KeptAttribute(attribute::name, L"", "").Optional()),
+                          {
+                              KeptAttribute(attribute::trackId, -1, "number of the track").Optional(),
+                              KeptAttribute(L"mdf_file", L"", "motion data file").Optional(),
+                              KeptAttribute(L"time_offset", 0.0F, "seconds").Optional(),
+                              KeptAttribute(L"play_loop", false, "").Optional(),
+                              KeptAttribute(L"data_source", 0, "").Optional(),
+                              KeptAttribute(L"auto_update", false, "").Optional(),
+                              KeptAttribute(L"active", false, "").Optional(),
+                              KeptAttribute(L"buffer_empty", false, "").Optional(),
+                          }});
+    return table;
+}
+
+struct Registry
+{
+    std::vector<const VtCAttributeTable*> tables;
+    std::unordered_map<std::wstring_view, const VtTAttributeRow*> byName;
+    std::vector<const VtTAttributeRow*> partRows;
+
+    Registry() { Add(TrackTable()); }
+
+    void Add(const VtCAttributeTable& table)
+    {
+        const auto at = std::lower_bound(tables.begin(), tables.end(), table.GetObjectType(),
+                                         [](const VtCAttributeTable* known, std::int32_t type)
+                                         { return known->GetObjectType() < type; });
+        if (at != tables.end() && (*at)->GetObjectType() == table.GetObjectType())
+            return;
+        for (const VtTAttributeRow& row : table.GetRows())
+        {
+            const VtTAttributeRow& known = *byName.try_emplace(*row.name, &row).first->second;
+            if (known.GetType() != row.GetType() || FixedLength(known.defaultValue) != FixedLength(row.defaultValue))
+                throw std::logic_error("attribute " + base::Utf8(*row.name) + " has two types");
+            if (row.forParts)
+                partRows.push_back(&row);
+        }
+        tables.insert(at, &table);
+    }
 };
 
-constexpr PartAttribute partAttributes[] = {
-    {L"_simulation_data_index", Type::text},
-    {L"_simulation_data_stream", Type::integer},
-    {L"_name", Type::text},
-    {L"_position", Type::floatTupel3},
-    {L"_rotation", Type::floatTupel3},
-    {L"_scale", Type::floatTupel3},
-    {L"_scale_orient", Type::floatTupel3},
-};
-
-constexpr VtTFloatTupel3 zero{0, 0, 0};
-constexpr VtTFloatTupel3 unitScale{1, 1, 1};
-
-void AddViewDefaults(VtISceneObject& object)
+Registry& Registered()
 {
-    object.AddAttribute(L"observer", std::wstring());
-    object.AddAttribute(L"track", -1);
-    object.AddAttribute(L"view_angle", 40.0F);
-    object.AddAttribute(L"front_clip_plane", 0.015F);
-    object.AddAttribute(L"back_clip_plane", 10000.0F);
-    object.AddAttribute(L"view_pos", 0);
+    static Registry registry;
+    return registry;
 }
 
-// The mode stands first: whether the observer is free decides how the rest is taken.
-void AddObserverDefaults(VtISceneObject& object, std::int32_t followMode)
+const VtTAttributeRow* FindRow(std::wstring_view name)
 {
-    object.AddAttribute(L"behaviour", followMode);
-    object.AddAttribute(L"attached_to", std::wstring(L"Not connected"));
-    object.AddAttribute(L"position", zero);
-    object.AddAttribute(L"orientation", zero);
-    object.AddAttribute(L"translation", zero);
-    object.AddAttribute(L"rotation", zero);
+    const auto& byName = Registered().byName;
+    const auto at = byName.find(name);
+    return at == byName.end() ? nullptr : at->second;
 }
 
-void AddBodyDefaults(VtISceneObject& object)
+bool IsOfPart(std::wstring_view name, std::wstring_view rowName)
 {
-    object.AddAttribute(L"visible", 1);
-    object.AddAttribute(L"selectable", 1);
-    object.AddAttribute(L"fixed_to_world", 0);
-    object.AddAttribute(L"transparency", 0.0F);
-    object.AddAttribute(L"render_mode", 1);
-    object.AddAttribute(L"dye_enabled", 0);
-    object.AddAttribute(L"dye_color", VtTIntTupel3{0, 0, 0});
-    object.AddAttribute(L"is_grouped", 0);
+    return name.size() > rowName.size() && name.ends_with(rowName) && name[name.size() - rowName.size() - 1] == L'_';
 }
 
 } // namespace
 
+void RegisterAttributeTable(const VtCAttributeTable& table)
+{
+    Registered().Add(table);
+}
+
+const std::vector<const VtCAttributeTable*>& GetAttributeTables()
+{
+    return Registered().tables;
+}
+
 std::optional<VtEAttributeType> FixedAttributeType(std::wstring_view name)
 {
-    const auto at = FixedTypes().find(name);
-    return at == FixedTypes().end() ? std::nullopt : std::optional(at->second);
+    const VtTAttributeRow* row = FindRow(name);
+    return row ? std::optional(row->GetType()) : std::nullopt;
 }
 
 VtEAttributeType AssumedAttributeType(std::wstring_view name)
 {
-    if (const std::optional<Type> fixed = FixedAttributeType(name))
-        return *fixed;
-    for (const PartAttribute& part : partAttributes)
-        if (name.ends_with(part.suffix))
-            return part.type;
-    return Type::text;
+    if (const VtTAttributeRow* row = FindRow(name))
+        return row->GetType();
+    for (const VtTAttributeRow* row : Registered().partRows)
+        if (IsOfPart(name, *row->name))
+            return row->GetType();
+    return VtEAttributeType::text;
 }
 
 std::optional<std::size_t> FixedListLength(std::wstring_view name)
 {
-    if (name == L"last_transform_matrix" || name == L"insert_transform_matrix")
-        return 16;
-    if (name == L"splitter_position")
-        return 2;
-    return std::nullopt;
+    const VtTAttributeRow* row = FindRow(name);
+    const std::size_t length = row ? FixedLength(row->defaultValue) : 0;
+    return length > 0 ? std::optional(length) : std::nullopt;
 }
 
 osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType)
 {
-    osg::ref_ptr<VtISceneObject> object = new VtISceneObject(objectType);
-    object->AddAttribute(L"object_type", objectType);
-    object->AddAttribute(L"internal_id", std::wstring());
-    object->AddAttribute(L"name", std::wstring());
-    switch (objectType)
-    {
-    case objectTypeWindowLayout:
-        object->Write(L"name", std::wstring(L"Window_Layout"));
-        object->AddAttribute(L"splitter_position", std::vector<float>{0.5F, 0.5F});
-        return object;
-    case objectTypeRenderSettings:
-        object->AddAttribute(L"global_render_mode", 5);
-        return object;
-    case objectTypeView:
-        AddViewDefaults(*object);
-        return object;
-    case objectTypeObserver:
-        AddObserverDefaults(*object, 1);
-        return object;
-    case objectTypeDefaultObserver:
-        AddObserverDefaults(*object, 0);
-        return object;
-    case objectTypeStaticBody:
-    case objectTypeMovableBody:
-        break;
-    default:
-        return nullptr;
-    }
-
-    object->AddAttribute(L"file_path", std::wstring());
-    object->AddAttribute(L"position", zero);
-    object->AddAttribute(L"rotation", zero);
-    object->AddAttribute(L"scale", unitScale);
-    if (objectType == objectTypeStaticBody)
-        object->AddAttribute(L"scale_orient", zero);
-    object->AddAttribute(L"center", zero);
-    if (objectType == objectTypeMovableBody)
-    {
-        // The index stands before the name, so that on replaying the record a name that the data point knows wins.
-        object->AddAttribute(L"simulation_data_stream", -1);
-        object->AddAttribute(L"simulation_data_index", std::wstring());
-        object->AddAttribute(L"last_transform_matrix",
-                             std::vector<float>{1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1});
-    }
-    AddBodyDefaults(*object);
-    return object;
+    for (const VtCAttributeTable* table : Registered().tables)
+        if (table->GetObjectType() == objectType)
+            return table->MakeRecord();
+    return nullptr;
 }

@@ -4,9 +4,11 @@
 #include <cstdint>
 #include <optional>
 #include <string_view>
+#include <vector>
 
 #include <osg/ref_ptr>
 
+#include "records/AttributeTable.h"
 #include "records/SceneObject.h"
 
 /// Types of records, as their attribute `object_type` numbers them.
@@ -23,6 +25,16 @@ enum VtEObjectType : std::int32_t
     objectTypeTrack = 8,
     objectTypeDefaultObserver = 9, ///< "Free1" and "Free2"
 };
+
+// The tables of all classes. Each folder that stores something has a function that tells its own; the application
+// object calls them. What follows is what the told tables say.
+
+/// Tells `table`, which lives as long as the program. One that is there already stays as it is. Throws
+/// `std::logic_error` when another table gives one of the names another type.
+void RegisterAttributeTable(const VtCAttributeTable& table);
+
+/// By their object types.
+const std::vector<const VtCAttributeTable*>& GetAttributeTables();
 
 /// The type that every record gives an attribute of that name; nothing for names that aren't fixed.
 std::optional<VtEAttributeType> FixedAttributeType(std::wstring_view name);

@@ -135,7 +135,7 @@ struct IsFinite
 
 void CheckFinite(const std::wstring& name, const VtTAttributeValue& value)
 {
-    if (!std::visit(IsFinite(), value))
+    if (!IsStorable(value))
         Refuse("attribute " + Quoted(base::Utf8(name)) + " takes finite numbers only");
 }
 
@@ -206,7 +206,12 @@ std::string AttributeValueToUtf8(const VtTAttributeValue& value)
     return std::visit(ToUtf8(), value);
 }
 
-VtTAttributeName ShareAttributeName(const std::wstring& name)
+bool IsStorable(const VtTAttributeValue& value)
+{
+    return std::visit(IsFinite(), value);
+}
+
+VtTAttributeName ShareAttributeName(std::wstring_view name)
 {
     constexpr std::size_t mostNames = 500; // they come from files too
     static std::unordered_map<std::wstring_view, VtTAttributeName> names;
@@ -247,6 +252,7 @@ void VtISceneAttribute::SetValue(VtTAttributeValue newValue)
         return;
 
     value = std::move(newValue);
+    ++changes;
     if (owner)
         owner->Fire(*this);
 }

@@ -55,11 +55,14 @@ VtTAttributeValue AttributeValueFromText(VtEAttributeType type, std::string_view
 std::wstring AttributeValueToText(const VtTAttributeValue& value);
 std::string AttributeValueToUtf8(const VtTAttributeValue& value);
 
+/// False for a value with numbers that aren't finite: no record could be read back with them.
+bool IsStorable(const VtTAttributeValue& value);
+
 /// The name of an attribute. All records share a few names, which take more room than most values.
 using VtTAttributeName = std::shared_ptr<const std::wstring>;
 
 /// The one copy of `name` that the attributes of this name share; a copy of its own if there are too many names.
-VtTAttributeName ShareAttributeName(const std::wstring& name);
+VtTAttributeName ShareAttributeName(std::wstring_view name);
 
 /// One named value of a record. The type is fixed when it is made.
 class VtISceneAttribute : public osg::Referenced
@@ -73,6 +76,9 @@ public:
     const VtTAttributeValue& GetValue() const { return value; }
     std::wstring GetValueText() const { return AttributeValueToText(value); }
 
+    /// How often the value has changed since the attribute was made.
+    std::uint32_t GetChangeCount() const { return changes; }
+
     /// Stores `newValue` and, if it differs from the present one, tells the listeners of the record.
     ///
     /// An integer is taken for a float attribute; any other value of a foreign type throws `VtCAttributeError`, and
@@ -84,5 +90,6 @@ private:
 
     VtTAttributeName name;
     VtTAttributeValue value;
+    std::uint32_t changes = 0;
     VtISceneObject* owner = nullptr; ///< null once the record has let it go
 };

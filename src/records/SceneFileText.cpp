@@ -1,4 +1,5 @@
 #include "records/SceneFileText.h"
+#include "records/AttributeNames.h"
 
 #include "base/Text.h"
 #include "records/ObjectElement.h"
@@ -186,7 +187,7 @@ public:
 
     void Add(const VtISceneObject& object, std::ptrdiff_t offset)
     {
-        const auto* id = object.Find<std::wstring>(L"internal_id");
+        const auto* id = object.Find<std::wstring>(attribute::internalId);
         if (!id || id->empty())
             return;
         const auto [at, isNew] = records.try_emplace(*id, Record{offset, {}, 0});
@@ -195,7 +196,7 @@ public:
                                            "\" is there already, in line " +
                                            std::to_string(LineOf(at->second.offset, text))};
         if (object.GetObjectType() == objectTypeStaticBody)
-            if (const auto* parent = object.Find<std::wstring>(L"parent_object_id"))
+            if (const auto* parent = object.Find<std::wstring>(attribute::parentObjectId))
                 at->second.parent = *parent;
     }
 

@@ -20,6 +20,32 @@ bool IsSameName(std::wstring_view a, std::wstring_view b)
 
 } // namespace
 
+template <class Tell>
+void VtISceneObject::ForEachListener(VtISceneAttribute& attribute, Tell tell)
+{
+    if (listeners.empty())
+        return;
+
+    // What is told may drop the last reference to either.
+    const osg::ref_ptr<VtISceneObject> keepObject(this);
+    const osg::ref_ptr<VtISceneAttribute> keepAttribute(&attribute);
+    struct Firing
+    {
+        VtISceneObject& object;
+        explicit Firing(VtISceneObject& fired) : object(fired) { ++object.firing; }
+        ~Firing()
+        {
+            if (--object.firing == 0)
+                std::erase(object.listeners, nullptr);
+        }
+    } const guard(*this);
+
+    const std::size_t count = listeners.size();
+    for (std::size_t i = 0; i < count; ++i)
+        if (listeners[i] && !tell(*listeners[i]))
+            return;
+}
+
 VtISceneObject::VtISceneObject(std::int32_t objectType) : type(objectType)
 {
     attributes.reserve(usualAttributes);
@@ -53,12 +79,12 @@ void VtISceneObject::Index()
             byName.emplace(attribute->GetName(), attribute.get());
 }
 
-void VtISceneObject::AddAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name)
+void VtISceneObject::AddAttribute(std::wstring_view typeName, std::wstring_view valueText, std::wstring_view name)
 {
     AddAttribute(name, AttributeValueFromText(AttributeTypeFromName(base::Utf8(typeName)), valueText));
 }
 
-void VtISceneObject::AddAttribute(const std::wstring& name, VtTAttributeValue value)
+void VtISceneObject::AddAttribute(std::wstring_view name, VtTAttributeValue value)
 {
     VtISceneAttribute* old = GetAttribute(name);
     if (!old)
@@ -94,15 +120,21 @@ void VtISceneObject::Append(VtTAttributeName name, VtTAttributeValue value)
 
 void VtISceneObject::RemoveAttribute(std::wstring_view name)
 {
-    VtISceneAttribute* attribute = GetAttribute(name);
+    const osg::ref_ptr<VtISceneAttribute> attribute = GetAttribute(name);
     if (!attribute)
         return;
     byName.erase(name);
     attribute->owner = nullptr;
     attributes.erase(std::find(attributes.begin(), attributes.end(), attribute));
+    ForEachListener(*attribute,
+                    [&](IPropertyChangedCOMEvents& listener)
+                    {
+                        listener.OnPropertyRemoved(*this, *attribute);
+                        return true;
+                    });
 }
 
-void VtISceneObject::Write(const std::wstring& name, VtTAttributeValue value)
+void VtISceneObject::Write(std::wstring_view name, VtTAttributeValue value)
 {
     if (VtISceneAttribute* attribute = GetAttribute(name))
         attribute->SetValue(std::move(value));
@@ -128,25 +160,12 @@ void VtISceneObject::Unadvise(IPropertyChangedCOMEvents& listener)
 
 void VtISceneObject::Fire(VtISceneAttribute& attribute)
 {
-    if (listeners.empty())
-        return;
-
-    // What is told may drop the last reference to either.
-    const osg::ref_ptr<VtISceneObject> keepObject(this);
-    const osg::ref_ptr<VtISceneAttribute> keepAttribute(&attribute);
-    struct Firing
-    {
-        VtISceneObject& object;
-        explicit Firing(VtISceneObject& fired) : object(fired) { ++object.firing; }
-        ~Firing()
-        {
-            if (--object.firing == 0)
-                std::erase(object.listeners, nullptr);
-        }
-    } const guard(*this);
-
-    const std::size_t count = listeners.size();
-    for (std::size_t i = 0; i < count; ++i)
-        if (listeners[i])
-            listeners[i]->OnPropertyChanged(*this, attribute);
+    const std::uint32_t change = attribute.changes;
+    ForEachListener(attribute,
+                    [&](IPropertyChangedCOMEvents& listener)
+                    {
+                        listener.OnPropertyChanged(*this, attribute);
+                        // A later change has told the rest already, or the attribute is gone.
+                        return attribute.changes == change && attribute.owner == this;
+                    });
 }

@@ -17,8 +17,12 @@ class IPropertyChangedCOMEvents
 public:
     virtual ~IPropertyChangedCOMEvents() = default;
 
-    /// `attribute` holds the new value. Called within `SetValue`, or within the call that added the attribute.
+    /// `attribute` holds the new value. Called within `SetValue`, or within the call that added the attribute. When
+    /// somebody who is told changes the same attribute again, those behind him are told of the last value only.
     virtual void OnPropertyChanged(VtISceneObject& object, VtISceneAttribute& attribute) = 0;
+
+    /// `attribute`, with its last value, belongs to `object` no longer.
+    virtual void OnPropertyRemoved(VtISceneObject& /*object*/, VtISceneAttribute& /*attribute*/) {}
 };
 
 /// One record: the persistent values of one object of a scene, in the order they were added. Names are unique.
@@ -43,8 +47,8 @@ public:
 
     /// Adds an attribute; one of that name gives up its type and value to it. Throws `VtCAttributeError` for an
     /// empty name, an unknown type or a text that isn't a value of it; the record then stays as it was.
-    void AddAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name);
-    void AddAttribute(const std::wstring& name, VtTAttributeValue value);
+    void AddAttribute(std::wstring_view typeName, std::wstring_view valueText, std::wstring_view name);
+    void AddAttribute(std::wstring_view name, VtTAttributeValue value);
 
     /// The same, but one of that name stays as it is; false then.
     bool AddNewAttribute(VtTAttributeName name, VtTAttributeValue value);
@@ -52,7 +56,7 @@ public:
     void RemoveAttribute(std::wstring_view name);
 
     /// Sets the attribute, or adds it with the type of `value` when there is none.
-    void Write(const std::wstring& name, VtTAttributeValue value);
+    void Write(std::wstring_view name, VtTAttributeValue value);
 
     /// The value of `name` if it is there and of that type, else null. Valid until the attribute changes.
     template <class Type>
@@ -75,6 +79,9 @@ private:
     void Append(VtTAttributeName name, VtTAttributeValue value); // one that isn't there
     void Index();
     void Fire(VtISceneAttribute& attribute);
+
+    template <class Tell>
+    void ForEachListener(VtISceneAttribute& attribute, Tell tell);
 
     std::int32_t type;
     Attributes attributes;

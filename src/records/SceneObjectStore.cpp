@@ -1,4 +1,5 @@
 #include "records/SceneObjectStore.h"
+#include "records/AttributeNames.h"
 
 #include "base/AtomicFile.h"
 #include "base/Ids.h"
@@ -127,7 +128,7 @@ std::vector<osg::ref_ptr<VtISceneObject>> VtCSceneObjectStore::ReadFile(const st
     for (const osg::ref_ptr<VtISceneObject>& object : read.objects)
     {
         // A record without an id is nobody's, but it is written again.
-        const auto* id = object->Find<std::wstring>(L"internal_id");
+        const auto* id = object->Find<std::wstring>(attribute::internalId);
         const std::wstring key = id && !id->empty() ? *id : base::NewId();
         RemoveObject(key);
         AddObject(key, object);
@@ -152,7 +153,7 @@ void VtCSceneObjectStore::PartIds()
     const auto idOf = [](const VtISceneObject& object) -> const std::wstring&
     {
         static const std::wstring none;
-        const auto* id = object.Find<std::wstring>(L"internal_id");
+        const auto* id = object.Find<std::wstring>(attribute::internalId);
         return id ? *id : none;
     };
     const auto isKept = [&](const std::wstring& key)
@@ -169,7 +170,7 @@ void VtCSceneObjectStore::PartIds()
             continue;
         if (!isKept(id) && edited.insert(id).second)
             continue;
-        object->Write(L"internal_id", edited.contains(key) ? base::NewId() : key);
+        object->Write(attribute::internalId, edited.contains(key) ? base::NewId() : key);
     }
 }
 

@@ -2,6 +2,7 @@
 
 #include "interaction/CameraManipulator.h"
 #include "interaction/Observer.h"
+#include "records/AttributeNames.h"
 #include "render/Viewer.h"
 #include "scene/SceneServices.h"
 
@@ -43,12 +44,14 @@ void VtCBase3DView::setFarClipPlane(float distance)
 {
     farClipPlane = distance;
     updateProjection();
+    valueChanged(attribute::backClipPlane);
 }
 
 void VtCBase3DView::setNearClipPlane(float distance)
 {
     nearClipPlane = distance;
     updateProjection();
+    valueChanged(attribute::frontClipPlane);
 }
 
 void VtCBase3DView::setViewAngle(float angle)
@@ -58,6 +61,7 @@ void VtCBase3DView::setViewAngle(float angle)
     viewAngle = angle;
     updateProjection();
     frame.GetDocument().SetModified(true);
+    valueChanged(attribute::viewAngle);
 }
 
 void VtCBase3DView::updateProjection()
@@ -101,12 +105,14 @@ void VtCBase3DView::assignObserver(VtC3DObserver* newObserver)
     }
     observer = newObserver;
     observer->SetAssigned(true);
-    if (!view)
-        return;
-    observer->AddCamera(view->getCamera());
-    if (VtCOsgCameramanipulator* manipulator = GetManipulator())
-        manipulator->setObserver(observer, view.get());
-    observer->PushViewMatrix();
+    if (view)
+    {
+        observer->AddCamera(view->getCamera());
+        if (VtCOsgCameramanipulator* manipulator = GetManipulator())
+            manipulator->setObserver(observer, view.get());
+        observer->PushViewMatrix();
+    }
+    valueChanged(attribute::observer);
 }
 
 VtCOsgCameramanipulator* VtCBase3DView::GetManipulator() const

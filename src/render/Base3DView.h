@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 #include <osg/ref_ptr>
 #include <osg/Vec4f>
@@ -112,6 +113,9 @@ public:
 
 protected:
     VtCOsgCameramanipulator* GetManipulator() const;
+
+    /// A value that is stored under `attribute` has changed.
+    virtual void valueChanged(std::wstring_view /*attribute*/) {}
 
     VtIViewFrame& frame;
 

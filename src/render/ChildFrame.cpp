@@ -7,7 +7,7 @@
 #include "interaction/MouseInput.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
-#include "records/SceneObjectStore.h"
+#include "records/AttributeNames.h"
 #include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
@@ -85,13 +85,8 @@ void VtCChildFrame::CreateViews()
         [](VtCPanoramicView& view)
         {
             const VtISceneObject* record = view.getSceneObject();
-            if (const auto* name = record ? record->Find<std::wstring>(L"observer") : nullptr)
+            if (const auto* name = record ? record->Find<std::wstring>(attribute::observer) : nullptr)
                 view.assignObserverByName(std::wstring(*name));
-            // A new view begins with clip planes of its own; those of a loaded record are the user's.
-            if (const auto* nearPlane = record ? record->Find<float>(L"front_clip_plane") : nullptr)
-                view.setNearClipPlane(*nearPlane);
-            if (const auto* farPlane = record ? record->Find<float>(L"back_clip_plane") : nullptr)
-                view.setFarClipPlane(*farPlane);
         });
     viewsCreated = true;
     renderEmptyFrame(false);
@@ -167,14 +162,8 @@ void VtCChildFrame::ApplyViewRecord(std::int32_t pane, VtISceneObject& record, c
     VtCPanoramicView* view = splitter->getView(pane);
     if (!view)
         return;
-    // The values bring the new id with them, so the present one, which its own record is stored under, is kept here.
-    const VtISceneObject* own = view->getSceneObject();
-    const auto* ownId = own ? own->Find<std::wstring>(L"internal_id") : nullptr;
-    const std::wstring old = ownId ? *ownId : std::wstring();
     view->ApplyAttributes(record);
     view->RebindAttributes(id);
-    if (!old.empty() && !base::EqualsNoCase(old, id))
-        services.document.GetServices().store.RemoveObject(old);
 }
 
 void VtCChildFrame::ActivateObserver()

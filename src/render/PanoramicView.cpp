@@ -8,8 +8,10 @@
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
 #include "interaction/Pick.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
+#include "render/SplitterEx.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
@@ -20,8 +22,6 @@ namespace
 // Which default observer the next view takes: even calls the first, odd ones the second.
 int createdViews = 0;
 
-constexpr float nearDistance = 0.015f;
-constexpr float farDistance = 10000.0f;
 constexpr std::uint32_t messageEmptyViewport = 9020;
 
 } // namespace
@@ -30,13 +30,11 @@ VtCPanoramicView::VtCPanoramicView(VtIViewFrame& viewFrame, host::PaneWindow& pa
     : VtCBase3DView(viewFrame), window(paneWindow), mouseInput(*this)
 {
     window.SetEvents(&mouseInput);
-    osg::ref_ptr<VtISceneObject> record = MakeDefaultObject(objectTypeView);
-    if (!record)
-        return;
+    const osg::ref_ptr<VtISceneObject> record = Attributes().MakeRecord();
     const std::wstring id = base::NewId();
-    record->Write(L"internal_id", id);
+    record->Write(attribute::internalId, id);
     frame.GetDocument().GetServices().store.AddObject(id, record.get());
-    Listen(record.get());
+    Listen(record.get(), id);
 }
 
 VtCPanoramicView::~VtCPanoramicView()
@@ -49,30 +47,48 @@ VtCPanoramicView::~VtCPanoramicView()
             data->owner = nullptr;
         own->setUserData(nullptr);
     }
-    if (!sceneObject)
-        return;
-    if (const auto* id = sceneObject->Find<std::wstring>(L"internal_id"))
-        frame.GetDocument().GetServices().store.RemoveObject(*id);
-    Listen(nullptr);
+    sink.Disconnect();
+    frame.GetDocument().GetServices().store.RemoveObject(recordId);
 }
 
-void VtCPanoramicView::Listen(VtISceneObject* record)
+const VtCAttributeTable& VtCPanoramicView::Attributes()
 {
-    if (sceneObject)
-        sceneObject->Unadvise(*this);
+    using Self = VtCPanoramicView;
+    static const VtCAttributeTable table(
+        objectTypeView,
+        {IdentityRows(objectTypeView,
+                      Attribute<Self>(attribute::name, L"", &Self::setName, &Self::getName, "as the tree shows it")),
+         {
+             Attribute<Self>(attribute::viewPos, 0, &Self::setViewPosition, &Self::getViewPosition, "the pane, 1 to 4"),
+             Attribute<Self>(attribute::observer, L"", &Self::assignObserverByName, &Self::GiveObserver,
+                             "name of an observer"),
+             KeptAttribute(attribute::track, -1, "number of the track, -1 for none"),
+             Attribute<Self>(attribute::viewAngle, 40.0F, &Self::setViewAngle, &Self::getViewAngle,
+                             "degrees: half of what is seen across, in a portrait pane upright"),
+             Attribute<Self>(attribute::frontClipPlane, 0.015F, &Self::setNearClipPlane, &Self::getNearClipPlane,
+                             "metres"),
+             Attribute<Self>(attribute::backClipPlane, 10000.0F, &Self::setFarClipPlane, &Self::getFarClipPlane,
+                             "metres"),
+         }});
+    return table;
+}
+
+void RegisterViewAttributes()
+{
+    RegisterAttributeTable(VtCPanoramicView::Attributes());
+    RegisterAttributeTable(VtCSplitterEx::Attributes());
+}
+
+void VtCPanoramicView::Listen(VtISceneObject* record, const std::wstring& id)
+{
+    sink.Connect(record);
     sceneObject = record;
-    if (sceneObject)
-        sceneObject->Advise(*this);
+    recordId = id;
 }
 
-void VtCPanoramicView::Write(const wchar_t* attribute, VtTAttributeValue value)
+std::optional<std::wstring> VtCPanoramicView::GiveObserver() const
 {
-    if (!sceneObject)
-        return;
-    const bool outer = writing;
-    writing = true;
-    sceneObject->Write(attribute, std::move(value));
-    writing = outer;
+    return getObserver() ? std::optional(getObserver()->GetName()) : std::nullopt;
 }
 
 void VtCPanoramicView::setName(const std::wstring& newName)
@@ -80,13 +96,13 @@ void VtCPanoramicView::setName(const std::wstring& newName)
     if (newName == getName())
         return;
     VtCBase3DView::setName(newName);
-    Write(L"name", newName);
+    valueChanged(attribute::name);
 }
 
 void VtCPanoramicView::setViewPosition(std::int32_t position)
 {
     VtCBase3DView::setViewPosition(position);
-    Write(L"view_pos", position);
+    valueChanged(attribute::viewPos);
 }
 
 void VtCPanoramicView::attachView(osgViewer::View* newView)
@@ -106,10 +122,12 @@ void VtCPanoramicView::createOsgView()
     if (scene)
         made->setSceneData(scene->GetRootNode());
     if (VtC3DObservers* observers = frame.GetObservers())
-        assignObserver(createdViews++ % 2 == 0 ? observers->GetFree1() : observers->GetFree2());
+    {
+        // The one that the record tells of stays; it has been assigned while there was no camera yet.
+        VtC3DObserver* usual = createdViews++ % 2 == 0 ? observers->GetFree1() : observers->GetFree2();
+        assignObserver(getObserver() ? getObserver() : usual);
+    }
     setClearColor(200, 230, 255);
-    setNearClipPlane(nearDistance);
-    setFarClipPlane(farDistance);
     resize(clientRect);
     if (clientRect.width > 0 && clientRect.height > 0)
         addViewToViewer(made.get());
@@ -123,59 +141,31 @@ bool VtCPanoramicView::assignObserverByName(const std::wstring& observerName)
     if (!found)
         return false;
     assignObserver(found);
-    Write(L"observer", found->GetName());
     return true;
-}
-
-void VtCPanoramicView::ApplyAttributes(const VtISceneObject& record)
-{
-    // A copy of the list: a setter writes to the own record, which may be this one.
-    for (const osg::ref_ptr<VtISceneAttribute>& attribute : VtISceneObject::Attributes(record.GetAttributes()))
-    {
-        if (sceneObject.get() != &record)
-            Write(attribute->GetName().c_str(), attribute->GetValue());
-        AttributeChanged(attribute->GetName(), attribute->GetValue());
-    }
 }
 
 void VtCPanoramicView::RebindAttributes(const std::wstring& id)
 {
     VtISceneObjectStore& store = frame.GetDocument().GetServices().store;
-    VtISceneObject* stored = store.GetObject(id);
+    const osg::ref_ptr<VtISceneObject> stored = store.GetObject(id);
     if (!stored || stored == sceneObject)
         return;
-    if (sceneObject)
-        if (const auto* old = sceneObject->Find<std::wstring>(L"internal_id"); old && !base::EqualsNoCase(*old, id))
-            store.RemoveObject(std::wstring(*old));
-    Listen(stored);
+    if (!base::EqualsNoCase(recordId, id))
+        store.RemoveObject(recordId);
+    Listen(stored.get(), id);
 }
 
-void VtCPanoramicView::OnPropertyChanged(VtISceneObject&, VtISceneAttribute& attribute)
+void VtCPanoramicView::OnAttributeChanged(const std::wstring&, const std::wstring& attributeName,
+                                          const VtTAttributeValue& value)
 {
-    if (!writing)
-        AttributeChanged(attribute.GetName(), attribute.GetValue());
-}
-
-void VtCPanoramicView::AttributeChanged(const std::wstring& attribute, const VtTAttributeValue& value)
-{
-    const auto* text = std::get_if<std::wstring>(&value);
-    const auto* real = std::get_if<float>(&value);
-    const auto* number = std::get_if<std::int32_t>(&value);
-
     if (getView())
         resize(clientRect);
-    if (attribute == L"name" && text)
-        setName(*text);
-    else if (attribute == L"view_angle" && real)
-        setViewAngle(*real);
-    else if (attribute == L"front_clip_plane" && real)
-        setNearClipPlane(*real);
-    else if (attribute == L"back_clip_plane" && real)
-        setFarClipPlane(*real);
-    else if (attribute == L"observer" && text)
-        assignObserverByName(*text);
-    else if (attribute == L"view_pos" && number)
-        setViewPosition(*number);
+    Attributes().Take(*this, attributeName, value);
+}
+
+void VtCPanoramicView::OnRecordChanged()
+{
+    frame.GetDocument().SetModified(true);
 }
 
 bool VtCPanoramicView::TakesInput() const

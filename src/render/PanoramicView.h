@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string>
 
 #include <osg/ref_ptr>
@@ -7,6 +8,8 @@
 
 #include "host/Graphics.h"
 #include "interaction/MouseInput.h"
+#include "records/AttributeTable.h"
+#include "records/PGEventSink.h"
 #include "records/SceneObject.h"
 #include "render/Base3DView.h"
 
@@ -29,7 +32,7 @@ public:
 ///
 /// Its input takes what the window tells: a press makes it the active view, a double click selects the body under the
 /// pointer, or lets this view fill the frame.
-class VtCPanoramicView : public VtCBase3DView, private IPropertyChangedCOMEvents, private VtIViewInputOwner
+class VtCPanoramicView : public VtCBase3DView, public VtIRecordOwner, private VtIViewInputOwner
 {
 public:
     /// The window outlives the view. The record goes into the document's store.
@@ -49,11 +52,18 @@ public:
     VtCBaseMouseInput* getMouseInput() override { return &mouseInput; }
     void attachView(osgViewer::View* newView) override;
 
-    /// "internal_id", "name", "observer", "track", "view_angle", "front_clip_plane", "back_clip_plane", "view_pos".
     VtISceneObject* getSceneObject() const { return sceneObject.get(); }
 
+    /// What that record holds.
+    static const VtCAttributeTable& Attributes();
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(); }
+    const std::wstring& GetRecordId() const override { return recordId; }
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+    void OnRecordChanged() override;
+
     /// Takes the values of a stored record.
-    void ApplyAttributes(const VtISceneObject& record);
+    void ApplyAttributes(const VtISceneObject& record) { sink.Apply(sceneObject.get(), record); }
 
     /// Takes over the record that the store holds under `id`; nothing without one.
     void RebindAttributes(const std::wstring& id);
@@ -69,14 +79,17 @@ private:
     void OnPress() override;
     bool OnPointer() override;
     void OnDoubleClick(int x, int y) override;
-    void AttributeChanged(const std::wstring& attribute, const VtTAttributeValue& value);
-    void OnPropertyChanged(VtISceneObject& object, VtISceneAttribute& attribute) override;
-    void Write(const wchar_t* attribute, VtTAttributeValue value);
-    void Listen(VtISceneObject* record);
+    void valueChanged(std::wstring_view attribute) override { sink.WriteBack(sceneObject.get(), attribute); }
+    std::optional<std::wstring> GiveObserver() const;
+    void Listen(VtISceneObject* record, const std::wstring& id);
 
     host::PaneWindow& window;
     VtCViewInput mouseInput;
     host::Rectangle clientRect;
-    bool writing = false; ///< its own writes don't come back to it
     osg::ref_ptr<VtISceneObject> sceneObject;
+    std::wstring recordId; ///< what the store holds it under
+    VTIPGEventSink sink{*this};
 };
+
+/// Tells the tables of this folder: views and the window layout.
+void RegisterViewAttributes();

@@ -1,10 +1,13 @@
 #include "render/SplitterEx.h"
 
 #include <algorithm>
+#include <cmath>
 
 #include "base/Ids.h"
+#include "base/Text.h"
 #include "host/Messages.h"
 #include "host/ViewWindows.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "render/PanoramicView.h"
@@ -40,13 +43,11 @@ double Fraction(int part, int sum, double before)
 VtCSplitterEx::VtCSplitterEx(VtIViewFrame& viewFrame, host::SplitterWindow& splitterWindow)
     : frame(viewFrame), window(splitterWindow)
 {
-    if (osg::ref_ptr<VtISceneObject> record = MakeDefaultObject(objectTypeWindowLayout))
-    {
-        const std::wstring id = base::NewId();
-        record->Write(L"internal_id", id);
-        frame.GetDocument().GetServices().store.AddObject(id, record.get());
-        windowLayout = record;
-    }
+    const osg::ref_ptr<VtISceneObject> record = Attributes().MakeRecord();
+    const std::wstring id = base::NewId();
+    record->Write(attribute::internalId, id);
+    frame.GetDocument().GetServices().store.AddObject(id, record.get());
+    Listen(record.get(), id);
 
     const host::Rectangle client = window.GetClientRectangle();
     columns = {client.width / 2, client.width / 2};
@@ -65,9 +66,41 @@ VtCSplitterEx::VtCSplitterEx(VtIViewFrame& viewFrame, host::SplitterWindow& spli
 
 VtCSplitterEx::~VtCSplitterEx()
 {
-    if (windowLayout)
-        if (const auto* id = windowLayout->Find<std::wstring>(L"internal_id"))
-            frame.GetDocument().GetServices().store.RemoveObject(std::wstring(*id));
+    sink.Disconnect();
+    frame.GetDocument().GetServices().store.RemoveObject(recordId);
+}
+
+const VtCAttributeTable& VtCSplitterEx::Attributes()
+{
+    using Self = VtCSplitterEx;
+    static const VtCAttributeTable table(
+        objectTypeWindowLayout,
+        {IdentityRows(objectTypeWindowLayout, KeptAttribute(attribute::name, L"Window_Layout", "")),
+         {Attribute<Self>(
+             attribute::splitterPosition, std::vector<float>{0.5F, 0.5F}, &Self::TakePosition,
+             [](const Self& self) {
+                 return std::vector<float>{static_cast<float>(self.columnRatio0), static_cast<float>(self.rowRatio0)};
+             },
+             "fractions of the frame, from the left and from the top")}});
+    return table;
+}
+
+void VtCSplitterEx::OnAttributeChanged(const std::wstring&, const std::wstring& attributeName,
+                                       const VtTAttributeValue& value)
+{
+    Attributes().Take(*this, attributeName, value);
+}
+
+void VtCSplitterEx::OnRecordChanged()
+{
+    frame.GetDocument().SetModified(true);
+}
+
+void VtCSplitterEx::Listen(VtISceneObject* record, const std::wstring& id)
+{
+    sink.Connect(record);
+    windowLayout = record;
+    recordId = id;
 }
 
 VtCPanoramicView* VtCSplitterEx::getView(int pane) const
@@ -121,6 +154,11 @@ void VtCSplitterEx::setLayout(std::int32_t newLayout)
 
 void VtCSplitterEx::setSplitterPosition(double x, double y)
 {
+    PlaceBars(x, y, false);
+}
+
+void VtCSplitterEx::PlaceBars(double x, double y, bool fromRecord)
+{
     const host::Rectangle client = window.GetClientRectangle();
     if (client.width <= 0 || client.height <= 0)
     {
@@ -148,7 +186,7 @@ void VtCSplitterEx::setSplitterPosition(double x, double y)
     }
     else
         layout = rowAlone ? layoutTwoColumns : layoutFour;
-    LayOut();
+    LayOut(fromRecord);
 }
 
 void VtCSplitterEx::setPaneSizeFromActiveView(int width, int height)
@@ -211,7 +249,7 @@ VtCSplitterEx::Extent VtCSplitterEx::Share(const Extent& wished, int available)
     return second < minimumSize ? Extent{available, 0} : Extent{first, second};
 }
 
-void VtCSplitterEx::LayOut()
+void VtCSplitterEx::LayOut(bool fromRecord)
 {
     const host::Rectangle client = window.GetClientRectangle();
     const Extent width = Share(columns, client.width);
@@ -232,8 +270,11 @@ void VtCSplitterEx::LayOut()
         if (VtCPanoramicView* view = getView(pane))
             view->OnSize();
     }
-    if (!resizing)
-        UpdateRatios(width, height);
+    if (resizing)
+        return;
+    UpdateRatios(width, height);
+    if (!fromRecord)
+        sink.WriteBack(windowLayout.get(), attribute::splitterPosition);
 }
 
 void VtCSplitterEx::UpdateRatios(const Extent& width, const Extent& height)
@@ -244,9 +285,6 @@ void VtCSplitterEx::UpdateRatios(const Extent& width, const Extent& height)
     columnRatio1 = Fraction(width.second, sumX, columnRatio1);
     rowRatio0 = Fraction(height.first, sumY, rowRatio0);
     rowRatio1 = Fraction(height.second, sumY, rowRatio1);
-    if (windowLayout)
-        windowLayout->Write(L"splitter_position",
-                            std::vector<float>{static_cast<float>(columnRatio0), static_cast<float>(rowRatio0)});
 }
 
 void VtCSplitterEx::ApplyLayoutRecord(const std::wstring& id)
@@ -255,16 +293,26 @@ void VtCSplitterEx::ApplyLayoutRecord(const std::wstring& id)
     const osg::ref_ptr<VtISceneObject> record = store.GetObject(id);
     if (!record)
         return;
-    if (windowLayout && windowLayout != record)
-        if (const auto* old = windowLayout->Find<std::wstring>(L"internal_id"); old && *old != id)
-            store.RemoveObject(std::wstring(*old));
-    windowLayout = record;
-    if (const auto* position = record->Find<std::vector<float>>(L"splitter_position");
-        position && position->size() == 2)
+    if (!base::EqualsNoCase(recordId, id))
+        store.RemoveObject(recordId);
+    Listen(record.get(), id);
+    sink.Apply(windowLayout.get(), *record);
+}
+
+void VtCSplitterEx::TakePosition(const std::vector<float>& position)
+{
+    PlaceBars(position[0], position[1], true);
+    // The ratios of whole pixels, gap included, would move the bars a little with every load and save.
+    const host::Rectangle client = window.GetClientRectangle();
+    const auto keep = [](double& first, double& second, double stored, int size)
     {
-        const std::vector<float> stored = *position;
-        setSplitterPosition(stored[0], stored[1]);
-        // The ratios of whole pixels, gap included, would move the bars a little with every load and save.
-        record->Write(L"splitter_position", stored);
-    }
+        constexpr int rounding = gap + 1;
+        if (std::abs(first - stored) * size <= rounding)
+        {
+            first = stored;
+            second = 1 - stored;
+        }
+    };
+    keep(columnRatio0, columnRatio1, position[0], client.width);
+    keep(rowRatio0, rowRatio1, position[1], client.height);
 }

@@ -4,10 +4,14 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <string>
+#include <vector>
 
 #include <osg/ref_ptr>
 
 #include "host/Graphics.h"
+#include "records/AttributeTable.h"
+#include "records/PGEventSink.h"
 #include "records/SceneObject.h"
 
 namespace host
@@ -31,7 +35,7 @@ enum VtEViewLayout : std::int32_t
 /// All four always exist; the layout decides which of them have a size. A row or column that would get fewer than 100
 /// pixels collapses, and the other takes its room with the gap. The host places the windows and tells of drags of the
 /// bars and of its own size.
-class VtCSplitterEx
+class VtCSplitterEx : public VtIRecordOwner
 {
 public:
     static constexpr int minimumSize = 100; ///< pixels
@@ -39,7 +43,7 @@ public:
 
     /// Makes the panes, with half the client size each. The window outlives this.
     VtCSplitterEx(VtIViewFrame& viewFrame, host::SplitterWindow& splitterWindow);
-    ~VtCSplitterEx();
+    virtual ~VtCSplitterEx();
     VtCSplitterEx(const VtCSplitterEx&) = delete;
     VtCSplitterEx& operator=(const VtCSplitterEx&) = delete;
 
@@ -76,6 +80,14 @@ public:
     /// The record "Window_Layout" with "splitter_position".
     VtISceneObject* getWindowLayout() const { return windowLayout.get(); }
 
+    /// What that record holds.
+    static const VtCAttributeTable& Attributes();
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(); }
+    const std::wstring& GetRecordId() const override { return recordId; }
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+    void OnRecordChanged() override;
+
     /// Takes over the record that the store holds under `id`, and its splitter position.
     void ApplyLayoutRecord(const std::wstring& id);
 
@@ -89,14 +101,19 @@ private:
         int second = 0;
     };
 
-    void LayOut();
+    void LayOut(bool fromRecord = false);
     void UpdateRatios(const Extent& columns, const Extent& rows);
+    void PlaceBars(double x, double y, bool fromRecord);
+    void TakePosition(const std::vector<float>& position);
+    void Listen(VtISceneObject* record, const std::wstring& id);
     static Extent Share(const Extent& wished, int available);
 
     VtIViewFrame& frame;
     host::SplitterWindow& window;
     std::array<std::unique_ptr<VtCPanoramicView>, 4> views;
     osg::ref_ptr<VtISceneObject> windowLayout;
+    std::wstring recordId; ///< what the store holds it under
+    VTIPGEventSink sink{*this};
     bool proportional = false;
     bool resizing = true;
     double columnRatio0 = 0.5;

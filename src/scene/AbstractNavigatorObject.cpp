@@ -2,6 +2,7 @@
 
 #include "base/Ids.h"
 #include "base/Text.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "scene/LibraryPath.h"
@@ -10,28 +11,13 @@
 #include <algorithm>
 #include <utility>
 
-using namespace std::string_view_literals;
-
 namespace
 {
-
-/// Keeps the sink quiet for as long as it lives, whatever is thrown.
-class OwnWrite
-{
-public:
-    explicit OwnWrite(int& writingDepth) : depth(writingDepth) { ++depth; }
-    ~OwnWrite() { --depth; }
-    OwnWrite(const OwnWrite&) = delete;
-    OwnWrite& operator=(const OwnWrite&) = delete;
-
-private:
-    int& depth;
-};
 
 // The record of a group is no body's when a scene is loaded again, so it outlives the body that it was made for.
 bool OutlivesItsBody(const VtISceneObject& record)
 {
-    const std::int32_t* grouped = record.Find<std::int32_t>(L"is_grouped");
+    const std::int32_t* grouped = record.Find<std::int32_t>(attribute::isGrouped);
     return record.GetObjectType() == objectTypeMovableBody && grouped && *grouped != 0;
 }
 
@@ -57,6 +43,7 @@ VtCGlidePanelAbstractNavigatorObject::VtCGlidePanelAbstractNavigatorObject(
     bool inTree, const std::wstring& id)
     : VtCGlidePanelAbstractObject(name, inTree),
       internalId(id.empty() ? base::NewId() : id),
+      attributeSink(std::make_unique<VTIPGEventSink>(*this)),
       displayName(name),
       document(&owningDocument)
 {
@@ -93,18 +80,8 @@ VtTSceneServices& VtCGlidePanelAbstractNavigatorObject::GetServices() const
 
 void VtCGlidePanelAbstractNavigatorObject::ApplyAttributes(VtISceneObject& source)
 {
-    // Handlers may add attributes to the record that is being read.
-    const VtISceneObject::Attributes& stored = source.GetAttributes();
-    const VtISceneObject::Attributes attributes(stored.begin(), stored.end());
-    for (const osg::ref_ptr<VtISceneAttribute>& attribute : attributes)
-    {
-        const std::wstring& name = attribute->GetName();
-        const VtTAttributeValue value = attribute->GetValue();
-        // A loaded object takes `source` itself over afterwards, in place of the record that it was made with.
-        if (!loading)
-            MergeAttribute(name, value);
-        OnAttributeChanged(internalId, name, value);
-    }
+    // A loaded object takes `source` itself over afterwards, in place of the record that it was made with.
+    attributeSink->Apply(loading ? nullptr : attributeObject.get(), source);
     if (attributeObject && !loading)
         GetServices().store.AddObject(internalId, attributeObject);
 }
@@ -131,11 +108,20 @@ void VtCGlidePanelAbstractNavigatorObject::RemoveAttributeObject()
 void VtCGlidePanelAbstractNavigatorObject::OnAttributeChanged(const std::wstring&, const std::wstring& attributeName,
                                                               const VtTAttributeValue& value)
 {
-    const std::wstring* text = std::get_if<std::wstring>(&value);
-    if (attributeName != L"name" || !text)
-        return;
-    displayName = *text;
-    SetModified();
+    GetAttributeTable().Take(*this, attributeName, value);
+}
+
+VtTAttributeRow VtCGlidePanelAbstractNavigatorObject::NameRow()
+{
+    using Self = VtCGlidePanelAbstractNavigatorObject;
+    return Attribute<Self>(attribute::name, L"", &Self::SetDisplayName, &Self::displayName, "as the tree shows it")
+        .ForParts();
+}
+
+const VtCAttributeTable& VtCGlidePanelAbstractNavigatorObject::GetAttributeTable() const
+{
+    static const VtCAttributeTable table(-1, {VtTAttributeRows{NameRow()}});
+    return table;
 }
 
 void VtCGlidePanelAbstractNavigatorObject::AddChild(VtCGlidePanelAbstractNavigatorObject& child)
@@ -200,46 +186,31 @@ void VtCGlidePanelAbstractNavigatorObject::RebindAttributes(const std::wstring& 
     if (!attributeObject)
         return;
 
-    if (const std::wstring* path = attributeObject->Find<std::wstring>(L"file_path"))
-        WriteAttribute(L"file_path", ToPortablePath(*path, GetServices().paths));
+    if (const std::wstring* path = attributeObject->Find<std::wstring>(attribute::filePath))
+        WriteAttribute(attribute::filePath, ToPortablePath(*path, GetServices().paths));
     PublishAttributes();
 }
 
-void VtCGlidePanelAbstractNavigatorObject::WriteAttribute(const std::wstring& name, VtTAttributeValue value)
+void VtCGlidePanelAbstractNavigatorObject::WriteAttribute(std::wstring_view name, VtTAttributeValue value)
 {
-    if (!attributeObject)
-        return;
-    const OwnWrite guard(writing);
-    attributeObject->Write(name, std::move(value));
+    attributeSink->Write(attributeObject.get(), name, std::move(value));
 }
 
-void VtCGlidePanelAbstractNavigatorObject::MergeAttribute(const std::wstring& name, const VtTAttributeValue& value)
+void VtCGlidePanelAbstractNavigatorObject::AddMissingAttribute(std::wstring_view name)
 {
-    if (!attributeObject)
-        return;
-    const OwnWrite guard(writing);
-    VtISceneAttribute* present = attributeObject->GetAttribute(name);
-    if (present && present->GetValue().index() == value.index())
-        present->SetValue(value);
-    else
-        attributeObject->AddAttribute(name, value);
+    AddMissingAttribute(name, GetAttributeTable().Find(name)->defaultValue);
 }
 
-void VtCGlidePanelAbstractNavigatorObject::AddMissingAttribute(std::wstring_view typeName, std::wstring_view valueText,
-                                                               const std::wstring& name)
+void VtCGlidePanelAbstractNavigatorObject::AddMissingAttribute(std::wstring_view name, VtTAttributeValue value)
 {
-    if (!attributeObject || attributeObject->GetAttribute(name))
-        return;
-    const OwnWrite guard(writing);
-    attributeObject->AddAttribute(typeName, valueText, name);
+    if (attributeObject && !attributeObject->GetAttribute(name))
+        WriteAttribute(name, std::move(value));
 }
 
 void VtCGlidePanelAbstractNavigatorObject::PublishAttributes()
 {
     if (!attributeObject)
         return;
-    if (!attributeSink)
-        attributeSink = std::make_unique<VTIPGEventSink>(*this);
     attributeSink->Connect(attributeObject);
     GetServices().store.AddObject(internalId, attributeObject);
 }

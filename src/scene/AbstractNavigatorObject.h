@@ -7,9 +7,10 @@
 
 #include <osg/ref_ptr>
 
+#include "records/AttributeTable.h"
+#include "records/PGEventSink.h"
 #include "records/SceneObject.h"
 #include "scene/AbstractObject.h"
-#include "scene/PGEventSink.h"
 
 class VtISceneDocument;
 struct VtTSceneServices;
@@ -17,9 +18,9 @@ struct VtTSceneServices;
 /// An object with an identity, a place in the object tree and a record in the attribute store.
 ///
 /// A parent holds the one lasting reference to each of its children; an object made without a parent belongs to who
-/// made it. All persistent state changes one way: a write to the record ends in `OnAttributeChanged`, and loading is
-/// the replaying of a stored record through the same handler.
-class VtCGlidePanelAbstractNavigatorObject : public VtCGlidePanelAbstractObject
+/// made it. The table of a class says what it stores. A write to the record ends in `OnAttributeChanged`, loading is
+/// the replaying of a stored record through the same handler, and a setter writes the record when it has set the field.
+class VtCGlidePanelAbstractNavigatorObject : public VtCGlidePanelAbstractObject, public VtIRecordOwner
 {
 public:
     using Objects = std::vector<VtCGlidePanelAbstractNavigatorObject*>;
@@ -29,7 +30,7 @@ public:
     /// Format of the object's section in a settings file, empty for objects without one.
     virtual std::wstring GetSectionFormat() const { return {}; }
 
-    /// Merges `source` into the object's own record and applies every attribute, in the order of `source`. While
+    /// Merges `source` into the object's own record and applies every attribute, in the order of the table. While
     /// `IsLoading` it only applies them, for the loader has the object take `source` over by `RebindAttributes`.
     virtual void ApplyAttributes(VtISceneObject& source);
 
@@ -42,10 +43,15 @@ public:
     /// Ends the event connection and takes the record out of the store; the object keeps its reference to it.
     virtual void RemoveAttributeObject();
 
-    /// The one handler of attribute changes. The base knows `name`; other names are ignored, and so is a value of
-    /// another type than the attribute's.
-    virtual void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                                    const VtTAttributeValue& value);
+    /// The one handler of attribute changes: what the table of the class knows. Other names are ignored, and so is a
+    /// value of another type than the attribute's.
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+
+    /// That of an object without a record of its own knows `name`.
+    const VtCAttributeTable& GetAttributeTable() const override;
+    const std::wstring& GetRecordId() const override { return internalId; }
+    void OnRecordChanged() override { SetModified(); }
 
     /// The name shown in the tree, and its record's `name`.
     const std::wstring& GetName() const { return displayName; }
@@ -78,9 +84,6 @@ public:
     bool IsLoading() const { return loading; }
     void SetLoading(bool flag) { loading = flag; }
 
-    /// True while the object writes to its own record.
-    bool IsWritingAttributes() const { return writing > 0; }
-
     VtISceneDocument& GetDocument() const { return *document; }
     VtTSceneServices& GetServices() const;
 
@@ -91,11 +94,18 @@ protected:
                                          bool inTree, const std::wstring& id);
     ~VtCGlidePanelAbstractNavigatorObject() override;
 
-    /// Sets or adds an attribute of the own record without hearing of it; nothing without a record.
-    void WriteAttribute(const std::wstring& name, VtTAttributeValue value);
+    /// The row of `name`, for the tables of the classes.
+    static VtTAttributeRow NameRow();
 
-    /// Adds an attribute to the own record unless it is there, with the text of its value.
-    void AddMissingAttribute(std::wstring_view typeName, std::wstring_view valueText, const std::wstring& name);
+    /// Sets or adds an attribute of the own record without hearing of it; nothing without a record.
+    void WriteAttribute(std::wstring_view name, VtTAttributeValue value);
+
+    /// Writes the field of the attribute, as the table gives it, to the own record.
+    void WriteBack(std::wstring_view name) { attributeSink->WriteBack(attributeObject.get(), name); }
+
+    /// Adds an attribute to the own record unless it is there: with the default of the table, or with `value`.
+    void AddMissingAttribute(std::wstring_view name);
+    void AddMissingAttribute(std::wstring_view name, VtTAttributeValue value);
 
     /// Listens to the record from now on and puts it into the store. Nothing without a record.
     void PublishAttributes();
@@ -106,16 +116,14 @@ protected:
     void SetDisplayName(const std::wstring& name) { displayName = name; }
 
     std::wstring internalId;
-    std::unique_ptr<VTIPGEventSink> attributeSink;
-    osg::ref_ptr<VtISceneObject> attributeObject; ///< null: writes to it are skipped
+    std::unique_ptr<VTIPGEventSink> attributeSink; ///< null only at the very end
+    osg::ref_ptr<VtISceneObject> attributeObject;  ///< null: writes to it are skipped
 
 private:
     void Forget(VtCGlidePanelAbstractNavigatorObject& child);
-    void MergeAttribute(const std::wstring& name, const VtTAttributeValue& value);
 
     std::wstring displayName;
     bool loading = false;
-    int writing = 0;
     VtISceneDocument* document;
     VtCGlidePanelAbstractNavigatorObject* parent = nullptr;
     Objects children;

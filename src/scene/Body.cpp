@@ -2,14 +2,12 @@
 
 #include "base/Text.h"
 #include "host/Messages.h"
-#include "records/RecordTables.h"
+#include "records/AttributeNames.h"
 #include "records/SceneObjectStore.h"
 #include "scene/BoundingBox.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
 #include "scene/UserData.h"
-
-using namespace std::string_view_literals;
 
 namespace
 {
@@ -69,9 +67,31 @@ void VtC3DBody::SetVisible(bool flag)
 {
     if (!transformNode)
         return;
+    ShowNode(flag);
+    WriteBack(attribute::visible);
+}
+
+void VtC3DBody::ShowNode(bool flag)
+{
+    if (!transformNode)
+        return;
     visible = flag;
     transformNode->setNodeMask(flag ? shownMask : 0);
-    WriteAttribute(L"visible", flag ? 1 : 0);
+}
+
+void VtC3DBody::SetPlacement(osg::Vec3f VtC3DBody::*field, int axis, float value)
+{
+    if (!std::isfinite(value))
+        return;
+    (this->*field)[axis] = value;
+    UpdateBaseTransform();
+    WriteBack(AttributeOf(field));
+}
+
+void VtC3DBody::SetScaleOrientation(const osg::Vec3f& value)
+{
+    scaleOrientation = value;
+    WriteBack(AttributeOf(&VtC3DBody::scaleOrientation));
 }
 
 void VtC3DBody::SetBoundingBoxVisible(bool flag)
@@ -104,18 +124,51 @@ void VtC3DBody::ReplaceModel(osg::Group* node)
     BuildMaterialMaps();
 }
 
-void VtC3DBody::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                                   const VtTAttributeValue& value)
+VtTAttributeRow VtC3DBody::FilePathRow()
 {
-    const std::int32_t* flag = std::get_if<std::int32_t>(&value);
-    if (flag && attributeName == L"selectable"sv)
-        selectable = *flag > 0;
-    else if (flag && attributeName == L"fixed_to_world"sv)
-        fixedToWorld = *flag > 0;
-    else if (flag && attributeName == L"visible"sv)
-        SetVisible(*flag > 0);
-    else
-        VtCGlidePanelAbstractNavigatorObject::OnAttributeChanged(objectId, attributeName, value);
+    return KeptAttribute(attribute::filePath, L"", "the model, with the token of its library in front");
+}
+
+VtTAttributeRow VtC3DBody::PlacementRow(std::wstring_view name, osg::Vec3f VtC3DBody::*field, const VtTAxes& axes,
+                                        const VtTFloatTupel3& defaultValue, std::string_view meaning)
+{
+    const auto take = [field, axes](VtC3DBody& body, const VtTFloatTupel3& stored)
+    {
+        body.*field = FieldFromRecord(axes, stored);
+        // The scaling axes wait for the next change of another value.
+        if (field != &VtC3DBody::scaleOrientation)
+            body.UpdateBaseTransform();
+    };
+    const auto give = [field, axes](const VtC3DBody& body) { return RecordFromField(axes, body.*field); };
+    return Attribute<VtC3DBody>(name, defaultValue, take, give, meaning);
+}
+
+VtTAttributeRows VtC3DBody::AppearanceRows()
+{
+    using Self = VtC3DBody;
+    return {
+        Attribute<Self>(attribute::visible, true, &Self::ShowNode, &Self::visible, "0 or 1"),
+        Attribute<Self>(attribute::selectable, true, &Self::selectable, &Self::selectable, "0 or 1"),
+        Attribute<Self>(attribute::fixedToWorld, false, &Self::fixedToWorld, &Self::fixedToWorld, "0 or 1"),
+        Attribute<Self>(attribute::renderMode, VtERenderMode::Textured, &Self::TakeRenderMode, &Self::renderMode,
+                        "0 Gouraud, 1 textured, 2 flat, 3 wire frame, 4 transparent"),
+        Attribute<Self>(attribute::dyeColor, VtTIntTupel3{0, 0, 0}, &Self::TakeDyeColour, &Self::GiveDyeColour,
+                        "red, green, blue, 0 to 255"),
+        Attribute<Self>(
+            attribute::dyeEnabled, false, &Self::TakeDyeEnabled,
+            [](const Self& body) { return body.dye->enabled != 0; }, "0 or 1"),
+        Attribute<Self>(attribute::transparency, 0.0F, &Self::TakeTransparency, &Self::transparency,
+                        "0 opaque to 1 invisible; waits while the scene has a mode of its own"),
+    };
+}
+
+VtTAttributeRows VtC3DBody::GroupRows()
+{
+    return {
+        KeptAttribute(attribute::isGrouped, false, "0 or 1: the model consists of parts"),
+        KeptAttribute(attribute::childCount, 0, "of groups: number of parts").Optional(),
+        KeptAttribute(attribute::childIds, std::vector<std::wstring>(), "of groups: ids of the parts").Optional(),
+    };
 }
 
 void VtC3DBody::Destroy()
@@ -141,8 +194,8 @@ void VtC3DBody::MakeAttributeObject(const std::string& description, std::int32_t
 
 void VtC3DBody::AddMissingDyeAttributes()
 {
-    AddMissingAttribute(L"int", L"0", L"dye_enabled");
-    AddMissingAttribute(L"intTupel3", L"0 0 0", L"dye_color");
+    AddMissingAttribute(attribute::dyeEnabled);
+    AddMissingAttribute(attribute::dyeColor);
 }
 
 bool VtC3DBody::IsOwnOrAncestorFile(const std::wstring& path) const

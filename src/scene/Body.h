@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -12,7 +13,8 @@
 #include <osg/Vec3f>
 
 #include "scene/AbstractNavigatorObject.h"
-#include "scene/MaterialCollector.h"
+#include "scene/Collectors.h"
+#include "scene/Placement.h"
 #include "scene/RenderMode.h"
 
 /// The colour of a body's untextured surfaces, while it is enabled.
@@ -41,22 +43,22 @@ public:
     const osg::Vec3f& GetRotation() const { return rotation; }
     const osg::Vec3f& GetPosition() const { return position; }
 
-    /// Each of these stores, recomputes the transform and marks the document as changed.
-    void SetScaleX(float value) { SetPlacement(scale, 0, value); }
-    void SetScaleY(float value) { SetPlacement(scale, 1, value); }
-    void SetScaleZ(float value) { SetPlacement(scale, 2, value); }
-    void SetCenterX(float value) { SetPlacement(center, 0, value); }
-    void SetCenterY(float value) { SetPlacement(center, 1, value); }
-    void SetCenterZ(float value) { SetPlacement(center, 2, value); }
-    void SetRotationX(float value) { SetPlacement(rotation, 0, value); }
-    void SetRotationY(float value) { SetPlacement(rotation, 1, value); }
-    void SetRotationZ(float value) { SetPlacement(rotation, 2, value); }
-    void SetPositionX(float value) { SetPlacement(position, 0, value); }
-    void SetPositionY(float value) { SetPlacement(position, 1, value); }
-    void SetPositionZ(float value) { SetPlacement(position, 2, value); }
+    /// Each of these stores, recomputes the transform and writes the record. What isn't a finite number is ignored.
+    void SetScaleX(float value) { SetPlacement(&VtC3DBody::scale, 0, value); }
+    void SetScaleY(float value) { SetPlacement(&VtC3DBody::scale, 1, value); }
+    void SetScaleZ(float value) { SetPlacement(&VtC3DBody::scale, 2, value); }
+    void SetCenterX(float value) { SetPlacement(&VtC3DBody::center, 0, value); }
+    void SetCenterY(float value) { SetPlacement(&VtC3DBody::center, 1, value); }
+    void SetCenterZ(float value) { SetPlacement(&VtC3DBody::center, 2, value); }
+    void SetRotationX(float value) { SetPlacement(&VtC3DBody::rotation, 0, value); }
+    void SetRotationY(float value) { SetPlacement(&VtC3DBody::rotation, 1, value); }
+    void SetRotationZ(float value) { SetPlacement(&VtC3DBody::rotation, 2, value); }
+    void SetPositionX(float value) { SetPlacement(&VtC3DBody::position, 0, value); }
+    void SetPositionY(float value) { SetPlacement(&VtC3DBody::position, 1, value); }
+    void SetPositionZ(float value) { SetPlacement(&VtC3DBody::position, 2, value); }
 
-    /// Stores only: takes effect with the next change of another placement value.
-    void SetScaleOrientation(const osg::Vec3f& value) { scaleOrientation = value; }
+    /// Takes effect with the next change of another placement value.
+    void SetScaleOrientation(const osg::Vec3f& value);
 
     const osg::Matrixd& GetBaseMatrix() const { return baseMatrix; }
 
@@ -85,8 +87,12 @@ public:
 
     float GetTransparency() const { return transparency; }
 
-    /// 0 opaque, 1 invisible; stored only, `ApplyTransparency` makes it seen.
+    /// 0 opaque, 1 invisible; `ApplyTransparency` makes it seen.
     void SetTransparency(float value);
+
+    /// While the scene has a mode of its own, a `transparency` that is written to the record waits there. When bodies
+    /// use their own modes again, it becomes the body's.
+    void TakeWaitingTransparency();
 
     /// Blends the materials by the body's transparency when `mode` is `Transparent`, else as the file has them.
     void ApplyTransparency(VtERenderMode mode);
@@ -134,9 +140,6 @@ public:
     bool IsGroupChild() const { return isGroupChild; }
     const std::vector<std::wstring>& GetChildIds() const { return childIds; }
 
-    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                            const VtTAttributeValue& value) override;
-
     /// Takes the body out of the graph and out of its parent, which is its end.
     void Destroy();
 
@@ -160,16 +163,24 @@ protected:
     /// After a change of dye: moves to the right model, colours it, blends it.
     void RefreshAppearance();
 
-    /// Colours the model with the stored dye if it is enabled, else takes the colours back.
-    void ApplyStoredDye();
+    // Rows for the tables of the classes.
 
-    /// Stores the colour of `dye_color` without showing it.
-    void StoreDyeColour(const VtTIntTupel3& colour);
+    static VtTAttributeRow FilePathRow();
+    static VtTAttributeRow PlacementRow(std::wstring_view name, osg::Vec3f VtC3DBody::*field, const VtTAxes& axes,
+                                        const VtTFloatTupel3& defaultValue, std::string_view meaning);
+
+    /// What the body looks like and what an editor may do with it. The mode stands before what is seen in that mode.
+    static VtTAttributeRows AppearanceRows();
+    static VtTAttributeRows GroupRows();
+
+    /// The attribute that stores a field of the placement; empty when the class doesn't store it.
+    virtual std::wstring_view AttributeOf(osg::Vec3f VtC3DBody::*) const { return {}; }
 
     /// Makes the record from `description` (UTF-8, may be empty), or from the default text of `objectType` when there
     /// is none or it isn't a record. That is reported as a warning.
     void MakeAttributeObject(const std::string& description, std::int32_t objectType, bool recordFollows);
 
+    /// Records of older scenes lack them.
     void AddMissingDyeAttributes();
 
     /// True when the model at `path` is this body's or that of a body above it, so that a part of it would never end.
@@ -199,12 +210,19 @@ protected:
     osg::ref_ptr<osg::Node> modelNode;          ///< shared with other bodies, except in a clone
 
 private:
-    void SetPlacement(osg::Vec3f& vector, int axis, float value)
-    {
-        vector[axis] = value;
-        UpdateBaseTransform();
-        SetModified();
-    }
+    void SetPlacement(osg::Vec3f VtC3DBody::*field, int axis, float value);
+    void ShowNode(bool flag);
+    void PaintDye();
+    void UnpaintDye();
+    void ApplyStoredDye();
+    void TakeRenderMode(VtERenderMode mode);
+    void TakeTransparency(float value);
+    void TakeDyeColour(const VtTIntTupel3& colour);
+    void TakeDyeEnabled(bool flag);
+    VtTIntTupel3 GiveDyeColour() const;
+
+    /// How the body is drawn now: in the scene's mode, or in its own.
+    VtERenderMode GetShownMode() const;
 
     void ApplyRenderState(VtERenderMode mode);
     void ApplyModelFor(VtERenderMode mode);

@@ -1,5 +1,6 @@
 #include "scene/Body.h"
 
+#include "records/AttributeNames.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
 
@@ -87,15 +88,27 @@ VtERenderMode VtC3DBody::GetGlobalMode() const
     return scene ? scene->GetGlobalRenderMode() : VtERenderMode::Mixed;
 }
 
+VtERenderMode VtC3DBody::GetShownMode() const
+{
+    const VtERenderMode global = GetGlobalMode();
+    return global == VtERenderMode::Mixed ? renderMode : global;
+}
+
 void VtC3DBody::SetRenderMode(VtERenderMode mode)
 {
     if (mode == renderMode)
         return;
-    renderMode = mode;
-    if (GetGlobalMode() == VtERenderMode::Mixed)
+    TakeRenderMode(mode);
+    WriteBack(attribute::renderMode);
+}
+
+void VtC3DBody::TakeRenderMode(VtERenderMode mode)
+{
+    if (mode != renderMode && GetGlobalMode() == VtERenderMode::Mixed)
         ApplyRenderState(mode);
-    SetModified();
-    WriteAttribute(L"render_mode", static_cast<std::int32_t>(mode));
+    renderMode = mode;
+    ApplyStoredDye();
+    ApplyTransparency(GetShownMode());
 }
 
 void VtC3DBody::ApplyGlobalMode(VtERenderMode mode)
@@ -107,7 +120,22 @@ void VtC3DBody::ApplyGlobalMode(VtERenderMode mode)
 void VtC3DBody::SetTransparency(float value)
 {
     transparency = value;
-    SetModified();
+    WriteBack(attribute::transparency);
+}
+
+void VtC3DBody::TakeTransparency(float value)
+{
+    if (GetGlobalMode() != VtERenderMode::Mixed)
+        return;
+    transparency = value;
+    ApplyStoredDye();
+    ApplyTransparency(renderMode);
+}
+
+void VtC3DBody::TakeWaitingTransparency()
+{
+    if (const float* stored = attributeObject ? attributeObject->Find<float>(attribute::transparency) : nullptr)
+        transparency = *stored;
 }
 
 void VtC3DBody::ApplyTransparency(VtERenderMode mode)
@@ -134,6 +162,14 @@ void VtC3DBody::ApplyTransparency(VtERenderMode mode)
 void VtC3DBody::SetDye(float red, float green, float blue)
 {
     *dye = {1, red, green, blue};
+    PaintDye();
+    WriteBack(attribute::dyeColor);
+    WriteBack(attribute::dyeEnabled);
+}
+
+void VtC3DBody::PaintDye()
+{
+    const auto [enabled, red, green, blue] = *dye;
     MoveToPrivateCopy();
     if (!IsOnPrivateCopy())
         return;
@@ -157,16 +193,36 @@ void VtC3DBody::SetDyeBytes(std::uint8_t red, std::uint8_t green, std::uint8_t b
     SetDye(static_cast<float>(red / 255.0), static_cast<float>(green / 255.0), static_cast<float>(blue / 255.0));
 }
 
-void VtC3DBody::StoreDyeColour(const VtTIntTupel3& colour)
+void VtC3DBody::TakeDyeColour(const VtTIntTupel3& colour)
 {
     dye->red = static_cast<float>(colour[0] / 255.0);
     dye->green = static_cast<float>(colour[1] / 255.0);
     dye->blue = static_cast<float>(colour[2] / 255.0);
+    if (dye->enabled != 0)
+        RefreshAppearance();
+}
+
+VtTIntTupel3 VtC3DBody::GiveDyeColour() const
+{
+    const auto byte = [](float part) { return static_cast<std::int32_t>(std::lround(part * 255.0)); };
+    return {byte(dye->red), byte(dye->green), byte(dye->blue)};
+}
+
+void VtC3DBody::TakeDyeEnabled(bool flag)
+{
+    dye->enabled = flag ? 1 : 0;
+    RefreshAppearance();
 }
 
 void VtC3DBody::ClearDye()
 {
     dye->enabled = 0;
+    UnpaintDye();
+    WriteBack(attribute::dyeEnabled);
+}
+
+void VtC3DBody::UnpaintDye()
+{
     if (!IsOnPrivateCopy())
         return; // the shared model was never dyed
     for (const auto& [drawable, record] : materials)
@@ -184,9 +240,9 @@ void VtC3DBody::ClearDye()
 void VtC3DBody::ApplyStoredDye()
 {
     if (dye->enabled != 0)
-        SetDye(dye->red, dye->green, dye->blue);
+        PaintDye();
     else
-        ClearDye();
+        UnpaintDye();
 }
 
 void VtC3DBody::RefreshAppearance()
@@ -194,7 +250,7 @@ void VtC3DBody::RefreshAppearance()
     if (GetGlobalMode() == VtERenderMode::Mixed)
         ApplyRenderState(renderMode);
     ApplyStoredDye();
-    ApplyTransparency(renderMode);
+    ApplyTransparency(GetShownMode());
 }
 
 osg::Node* VtC3DBody::GetModelClone()

@@ -5,9 +5,8 @@
 #include <vector>
 
 #include "scene/Bodies.h"
-#include "scene/BodyMotion.h"
+#include "scene/MovableBody.h"
 
-class VtC3DMovableBody;
 class VtCTrack;
 
 /// The movable bodies of one source: of the simulation itself, or the clones of a track.

@@ -1,15 +1,56 @@
 #pragma once
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include <osg/Matrixd>
+#include <osg/MatrixTransform>
+
 #include "scene/Body.h"
-#include "scene/BodyMotion.h"
 
 class VtCMovableBodies;
 class VtCTrack;
+
+/// What every frame reads and writes of a movable body, kept apart from the rest of it.
+///
+/// With thousands of bodies the time of a frame goes into memory that lies far apart, so these lie behind one another.
+struct VtTBodyMotion
+{
+    osg::MatrixTransform* node = nullptr; ///< the body's; not owned, null without one
+    std::int32_t simulationDataIndex = -1;
+    std::array<double, 12> base{};    ///< places the model at the simulated origin: four rows without the fourth column
+    osg::Matrixd lastTransformMatrix; ///< of the last frame; (3,3) is always 1
+
+    /// Takes the affine map `matrix` as the base.
+    void SetBase(const osg::Matrixd& matrix);
+
+    /// Takes the 16 floats of a frame's entry, column after column, as the last matrix and moves the node.
+    void SetLastTransformColumns(const float* values);
+
+    /// Sets the node to the base * `lastTransformMatrix`.
+    void MoveNode();
+};
+
+/// What `SetLastTransformColumns` does for affine maps on processors without wide registers; with the same results.
+void MoveByColumnsPortable(VtTBodyMotion& motion, const float* values);
+
+/// Storage of motions in blocks that never move. Bodies that are made one after another get neighbours.
+class VtCMotionPool
+{
+public:
+    VtTBodyMotion& Take();
+    void GiveBack(VtTBodyMotion& motion) { unused.push_back(&motion); }
+
+private:
+    static constexpr std::size_t blockSize = 256;
+
+    std::vector<std::unique_ptr<VtTBodyMotion[]>> blocks;
+    std::vector<VtTBodyMotion*> unused; ///< last first
+};
 
 /// A body that simulation data move.
 ///
@@ -81,13 +122,15 @@ public:
     /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
     void FinishLoad(const std::wstring& id);
 
-    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
-                            const VtTAttributeValue& value) override;
+    /// What its record holds. `position` is the field `center`: the stored place is that of the model in the body.
+    static const VtCAttributeTable& Attributes();
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(); }
 
 protected:
     ~VtC3DMovableBody() override;
     void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child) override;
     void SetTransformNode(osg::Group* node) override;
+    std::wstring_view AttributeOf(osg::Vec3f VtC3DBody::*field) const override;
 
 private:
     void JoinParent();
@@ -95,7 +138,7 @@ private:
     void ExpandGroup();
     void AddPart(const std::wstring& oldId, const std::wstring& newId, const std::wstring& path);
     void MoveAttribute(const std::wstring& oldName, const std::wstring& newName);
-    void OnChannelNameChanged(const std::wstring& name);
+    void TakeChannelName(const std::wstring& name);
 
     std::shared_ptr<VtCMotionPool> pool; ///< where `motion` is from
     VtTBodyMotion* motion;               ///< with the channel's index and the last matrix

@@ -1,6 +1,6 @@
 #include "scene/RoadSurface.h"
 
-#include "scene/GeodeCollector.h"
+#include "scene/Collectors.h"
 #include "scene/SceneServices.h"
 
 #include <algorithm>

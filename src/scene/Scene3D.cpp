@@ -3,12 +3,14 @@
 #include "base/Text.h"
 #include "host/Messages.h"
 #include "host/Storage.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
+#include "scene/Collectors.h"
 #include "scene/MovableBody.h"
 #include "scene/SceneLoader.h"
 #include "scene/SceneServices.h"
-#include "scene/ShaderCollector.h"
+#include "scene/StaticBody.h"
 
 #include <algorithm>
 
@@ -21,7 +23,7 @@ constexpr std::uint32_t textEnvironment = 6233;
 constexpr std::uint32_t textStaticBodies = 6234;
 constexpr std::uint32_t textMovableBodies = 6235;
 
-constexpr const wchar_t* renderSettingsId = L"render_settings";
+const std::wstring renderSettingsId = L"render_settings";
 
 void ApplyModeToAll(const VtC3DBodies& bodies, VtERenderMode mode, bool useOwnModes)
 {
@@ -29,7 +31,11 @@ void ApplyModeToAll(const VtC3DBodies& bodies, VtERenderMode mode, bool useOwnMo
     bodies.CollectDescendants(descendants);
     for (VtCGlidePanelAbstractNavigatorObject* object : descendants)
         if (auto* body = dynamic_cast<VtC3DBody*>(object))
+        {
+            if (mode == VtERenderMode::Mixed)
+                body->TakeWaitingTransparency();
             body->ApplyGlobalMode(useOwnModes ? body->GetRenderMode() : mode);
+        }
 }
 
 void AppendModelFiles(const VtC3DBodies& bodies, std::vector<std::wstring>& files)
@@ -89,15 +95,36 @@ void VtCScene3D::MakeRenderSettings()
     renderSettings = store.ParseObject(store.GetDefaultText(objectTypeRenderSettings)).object;
     if (!renderSettings)
         return;
-    WriteRenderSettings();
-    renderSettings->Write(L"internal_id", std::wstring(renderSettingsId));
+    settingsSink.WriteBack(renderSettings.get(), attribute::globalRenderMode);
+    renderSettings->Write(attribute::internalId, renderSettingsId);
+    settingsSink.Connect(renderSettings.get());
     store.AddObject(renderSettingsId, renderSettings);
 }
 
-void VtCScene3D::WriteRenderSettings()
+const VtCAttributeTable& VtCScene3D::Attributes()
 {
-    if (renderSettings)
-        renderSettings->Write(L"global_render_mode", static_cast<std::int32_t>(globalRenderMode));
+    static const VtCAttributeTable table(
+        objectTypeRenderSettings,
+        {IdentityRows(objectTypeRenderSettings, KeptAttribute(attribute::name, L"", "")),
+         {Attribute<VtCScene3D>(attribute::globalRenderMode, VtERenderMode::Mixed, &VtCScene3D::TakeGlobalRenderMode,
+                                &VtCScene3D::globalRenderMode, "as of bodies; 5 mixed: each body uses its own")}});
+    return table;
+}
+
+const std::wstring& VtCScene3D::GetRecordId() const
+{
+    return renderSettingsId;
+}
+
+void VtCScene3D::OnAttributeChanged(const std::wstring&, const std::wstring& attributeName,
+                                    const VtTAttributeValue& value)
+{
+    Attributes().Take(*this, attributeName, value);
+}
+
+void VtCScene3D::OnRecordChanged()
+{
+    document.SetModified(true);
 }
 
 void VtCScene3D::BuildGraph()
@@ -172,18 +199,28 @@ void VtCScene3D::CollectModelFiles(std::vector<std::wstring>& files) const
 
 void VtCScene3D::SetGlobalRenderMode(VtERenderMode mode, bool useOwnModes)
 {
+    ApplyGlobalRenderMode(mode, useOwnModes);
+    settingsSink.WriteBack(renderSettings.get(), attribute::globalRenderMode);
+}
+
+void VtCScene3D::ApplyGlobalRenderMode(VtERenderMode mode, bool useOwnModes)
+{
     ApplyModeToAll(*staticBodies, mode, useOwnModes);
     ApplyModeToAll(*movableBodies.front(), mode, useOwnModes);
     globalRenderMode = mode;
-    WriteRenderSettings();
+}
+
+void VtCScene3D::TakeGlobalRenderMode(VtERenderMode mode)
+{
+    const bool isMode = mode >= VtERenderMode::Gouraud && mode <= VtERenderMode::Mixed;
+    const VtERenderMode taken = isMode ? mode : VtERenderMode::Mixed;
+    ApplyGlobalRenderMode(taken, taken == VtERenderMode::Mixed);
 }
 
 void VtCScene3D::ChangeGlobalRenderMode(VtERenderMode mode, bool useOwnModes)
 {
-    if (mode == globalRenderMode)
-        return;
-    SetGlobalRenderMode(mode, useOwnModes);
-    document.SetModified(true);
+    if (mode != globalRenderMode)
+        SetGlobalRenderMode(mode, useOwnModes);
 }
 
 bool VtCScene3D::LoadSceneFile(const std::wstring& path, bool skip)
@@ -233,4 +270,11 @@ void VtCScene3D::UpdateFrame()
 {
     if (observers)
         observers->UpdateObservers();
+}
+
+void RegisterSceneAttributes()
+{
+    RegisterAttributeTable(VtCScene3D::Attributes());
+    RegisterAttributeTable(VtC3DStaticBody::Attributes());
+    RegisterAttributeTable(VtC3DMovableBody::Attributes());
 }

@@ -11,6 +11,8 @@
 #include <osg/Projection>
 #include <osg/ref_ptr>
 
+#include "records/AttributeTable.h"
+#include "records/PGEventSink.h"
 #include "records/SceneObject.h"
 #include "scene/MovableBodies.h"
 #include "scene/RenderMode.h"
@@ -25,12 +27,12 @@ class VtISceneViews;
 /// One scene: the top of the scene graph, the collections of bodies, and the render mode of all of them.
 ///
 /// A document makes one and keeps it for life; there is no emptying of a scene.
-class VtCScene3D
+class VtCScene3D : public VtIRecordOwner
 {
 public:
     /// Tells `owningDocument` (not owned) of itself before anything else, and leaves it unmodified.
     explicit VtCScene3D(VtISceneDocument& owningDocument);
-    ~VtCScene3D();
+    virtual ~VtCScene3D();
     VtCScene3D(const VtCScene3D&) = delete;
     VtCScene3D& operator=(const VtCScene3D&) = delete;
 
@@ -87,8 +89,16 @@ public:
     static VtERenderMode RenderModeFromText(std::wstring_view text) { return ::RenderModeFromText(text); }
     static std::wstring RenderModeToText(VtERenderMode mode) { return ::RenderModeToText(mode); }
 
-    /// The record of the render settings; null when the store has none to give.
+    /// The record of the render settings; null when the store has none to give. A write to it changes the mode.
     VtISceneObject* GetRenderSettings() const { return renderSettings.get(); }
+
+    /// What that record holds.
+    static const VtCAttributeTable& Attributes();
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(); }
+    const std::wstring& GetRecordId() const override;
+    void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                            const VtTAttributeValue& value) override;
+    void OnRecordChanged() override;
 
     // The scene file. Paths in the inner form. A record of a body without its name, file or id throws
     // `VtCAttributeError`, which ends the load; what was built until then stays.
@@ -134,12 +144,14 @@ public:
 private:
     void MakeRenderSettings();
     void BuildGraph();
-    void WriteRenderSettings();
+    void TakeGlobalRenderMode(VtERenderMode mode);
+    void ApplyGlobalRenderMode(VtERenderMode mode, bool useOwnModes);
 
     VtISceneDocument& document;
     std::int32_t maxTracks = 0;
     VtERenderMode globalRenderMode = VtERenderMode::Mixed;
     osg::ref_ptr<VtISceneObject> renderSettings;
+    VTIPGEventSink settingsSink{*this};
     osg::ref_ptr<osg::Group> rootNode;
     osg::ref_ptr<osg::Group> environmentNode;
     osg::ref_ptr<osg::Group> contentNode;
@@ -153,3 +165,6 @@ private:
     VtISceneViews* views = nullptr;
     std::vector<std::wstring> textureFiles;
 };
+
+/// Tells the tables of this folder: bodies and render settings.
+void RegisterSceneAttributes();

@@ -2,8 +2,8 @@
 
 #include "base/Text.h"
 #include "host/LibraryPaths.h"
+#include "records/AttributeNames.h"
 #include "records/RecordTables.h"
-#include "scene/EulerAngles.h"
 #include "scene/LibraryPath.h"
 #include "scene/RoadSurface.h"
 #include "scene/SceneServices.h"
@@ -11,19 +11,66 @@
 namespace
 {
 
-VtTFloatTupel3 TupelOf(const osg::Vec3d& vector)
-{
-    return {static_cast<float>(vector.x()), static_cast<float>(vector.y()), static_cast<float>(vector.z())};
-}
-
 // A model with the first three is a road.
-constexpr const wchar_t* roadParameters[] = {
+constexpr std::wstring_view roadParameters[] = {
     L"basetexture",     L"decalMap",        L"batterTexture", L"roadSurfaceTexture", L"roadFrictionMapTexture",
     L"roadSurfaceTexX", L"roadSurfaceTexY",
 };
 constexpr std::size_t neededParameters = 3;
 
+VtTAttributeRows RoadRows()
+{
+    VtTAttributeRows rows;
+    for (const std::wstring_view parameter : roadParameters)
+        rows.push_back(
+            KeptAttribute(parameter, L"", "of road models: parameter of the shader, \"kind,type,value\"").Optional());
+    return rows;
+}
+
 } // namespace
+
+const VtCAttributeTable& VtC3DStaticBody::Attributes()
+{
+    using Self = VtC3DStaticBody;
+    const VtTFloatTupel3 none{0, 0, 0};
+    static const VtCAttributeTable table(
+        objectTypeStaticBody,
+        {IdentityRows(objectTypeStaticBody, NameRow()),
+         {
+             FilePathRow(),
+             PlacementRow(attribute::scaleOrient, &Self::scaleOrientation, axesOfModels, none,
+                          "scene axes, degrees: the axes of scaling; seen with the next change of the placement")
+                 .ForParts(),
+             PlacementRow(attribute::scale, &Self::scale, percentOfModels, {1, 1, 1}, "scene axes, factors").ForParts(),
+             PlacementRow(attribute::center, &Self::center, axesOfModels, none,
+                          "scene axes, metres: of turning and scaling"),
+             PlacementRow(attribute::rotation, &Self::rotation, axesOfModels, none, "scene axes, degrees").ForParts(),
+             PlacementRow(attribute::position, &Self::position, axesOfModels, none, "scene axes, metres").ForParts(),
+         },
+         AppearanceRows(),
+         GroupRows(),
+         {KeptAttribute(attribute::parentObjectId, L"", "the static body above it").Optional()},
+         RoadRows()});
+    return table;
+}
+
+std::wstring_view VtC3DStaticBody::AttributeOf(osg::Vec3f VtC3DBody::*field) const
+{
+    using Self = VtC3DStaticBody;
+    return field == &Self::position   ? attribute::position
+           : field == &Self::rotation ? attribute::rotation
+           : field == &Self::center   ? attribute::center
+           : field == &Self::scale    ? attribute::scale
+                                      : attribute::scaleOrient;
+}
+
+void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
+                                         const VtTAttributeValue& value)
+{
+    VtC3DBody::OnAttributeChanged(objectId, attributeName, value);
+    if (isGrouped && !Attributes().Find(attributeName))
+        OnChildAttributeChanged(attributeName, value);
+}
 
 VtC3DStaticBody::VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                                  const std::wstring& name, const std::wstring& path,
@@ -59,19 +106,19 @@ void VtC3DStaticBody::FillAttributes(const osg::Matrixd& insertTransform)
 
     // A record of another type would come back as something else than a static body.
     attributeObject->SetObjectType(objectTypeStaticBody);
-    WriteAttribute(L"object_type", std::int32_t{objectTypeStaticBody});
-    WriteAttribute(L"name", GetName());
-    WriteAttribute(L"file_path", ToPortablePath(GetFilePath(), GetServices().paths));
-    AddMissingAttribute(L"floatTupel3", L"0.0 0.0 0.0", L"center");
-    WriteAttribute(L"position", TupelOf(translation));
-    WriteAttribute(L"scale", TupelOf(factors));
-    WriteAttribute(L"rotation", TupelOf(EulerAngles(turn)));
-    WriteAttribute(L"scale_orient", TupelOf(EulerAngles(scaleTurn)));
+    WriteAttribute(attribute::objectType, std::int32_t{objectTypeStaticBody});
+    WriteBack(attribute::name);
+    WriteAttribute(attribute::filePath, ToPortablePath(GetFilePath(), GetServices().paths));
+    AddMissingAttribute(attribute::center);
+    WriteAttribute(attribute::position, TupelOf(translation));
+    WriteAttribute(attribute::scale, TupelOf(factors));
+    WriteAttribute(attribute::rotation, TupelOf(EulerAngles(turn)));
+    WriteAttribute(attribute::scaleOrient, TupelOf(EulerAngles(scaleTurn)));
     if (const auto* above = dynamic_cast<VtC3DStaticBody*>(GetParent()))
-        WriteAttribute(L"parent_object_id", above->GetInternalId());
-    WriteAttribute(L"internal_id", internalId);
+        WriteAttribute(attribute::parentObjectId, above->GetInternalId());
+    WriteAttribute(attribute::internalId, internalId);
     AddMissingDyeAttributes();
-    if (const std::int32_t* grouped = attributeObject->Find<std::int32_t>(L"is_grouped"))
+    if (const std::int32_t* grouped = attributeObject->Find<std::int32_t>(attribute::isGrouped))
         isGrouped = *grouped != 0;
     if (isGrouped)
         ExpandGroup();
@@ -100,8 +147,8 @@ void VtC3DStaticBody::AssignShaders()
 
     VtTSceneServices& services = GetServices();
     AssignRoadSurface(*transformNode, services.models, services.paths.GetModuleDirectory());
-    for (const wchar_t* parameter : roadParameters)
-        ApplyShaderAttribute(roadShaderName, parameter);
+    for (const std::wstring_view parameter : roadParameters)
+        ApplyShaderAttribute(roadShaderName, std::wstring(parameter));
 }
 
 void VtC3DStaticBody::ApplyShaderAttribute(const std::wstring& shaderName, const std::wstring& attributeName)

@@ -36,19 +36,22 @@ public:
     /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
     virtual void FinishLoad(const std::wstring& id);
 
+    /// What the table knows, and of a group the values of its parts.
     void OnAttributeChanged(const std::wstring& objectId, const std::wstring& attributeName,
                             const VtTAttributeValue& value) override;
 
+    /// What its record holds: in the axes of the scene, where the fields stand in those of the models.
+    static const VtCAttributeTable& Attributes();
+    const VtCAttributeTable& GetAttributeTable() const override { return Attributes(); }
+
 protected:
     ~VtC3DStaticBody() override = default;
+    std::wstring_view AttributeOf(osg::Vec3f VtC3DBody::*field) const override;
 
 private:
-    /// Vectors and scale factors of a record, which stand in scene axes, as the fields hold them.
-    static osg::Vec3f ToModelAxes(const VtTFloatTupel3& stored);
-    static osg::Vec3f ToModelScale(const VtTFloatTupel3& stored);
-
     void FillAttributes(const osg::Matrixd& insertTransform);
     void ExpandGroup();
     void AddPart(const std::wstring& id, const std::wstring& path);
+    void SetStored(std::wstring_view name, const VtTAttributeValue& value); ///< into field and record
     void OnChildAttributeChanged(std::wstring_view attributeName, const VtTAttributeValue& value);
 };

@@ -5,6 +5,7 @@
 
 #include "base/Text.h"
 #include "records/ObjectText.h"
+#include "scene/Scene3D.h"
 
 namespace
 {
@@ -16,6 +17,12 @@ void Check(bool holds)
 }
 
 } // namespace
+
+extern "C" int LLVMFuzzerInitialize(int*, char***)
+{
+    RegisterSceneAttributes();
+    return 0;
+}
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {

@@ -2,6 +2,13 @@
 // back as the same bytes.
 #include "FuzzFile.h"
 #include "records/SceneFileText.h"
+#include "scene/Scene3D.h"
+
+extern "C" int LLVMFuzzerInitialize(int*, char***)
+{
+    RegisterSceneAttributes();
+    return 0;
+}
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {

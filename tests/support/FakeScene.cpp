@@ -5,6 +5,8 @@
 #include <osg/Material>
 #include <osg/Texture2D>
 
+#include "scene/Scene3D.h"
+
 namespace fake
 {
 
@@ -46,6 +48,12 @@ void ModelLibrary::setShaderParameter(osg::Node* node, const std::wstring& kind,
                                       const std::wstring& shaderName)
 {
     parameters.push_back({node, kind, name, type, value, shaderName});
+}
+
+SceneDocument::SceneDocument()
+    : services{store, models, paths, texts, messages, &channels, &configuration, &progress, &questions}
+{
+    RegisterSceneAttributes();
 }
 
 osg::ref_ptr<osg::Geode> MakeCube(const std::string& name, const osg::Vec4f& diffuse, bool textured)

@@ -84,13 +84,15 @@ public:
 class SceneDocument : public VtISceneDocument
 {
 public:
-    SceneDocument() : services{store, models, paths, texts, messages, &channels, &configuration, &progress, &questions}
-    {
-    }
+    SceneDocument();
 
     VtCScene3D* GetScene() const override { return scene; }
     void SetScene(VtCScene3D* newScene) override { scene = newScene; }
-    void SetModified(bool flag) override { modified = flag; }
+    void SetModified(bool flag) override
+    {
+        modified = flag;
+        ++modifications;
+    }
     VtTSceneServices& GetServices() override { return services; }
 
     VtCSceneObjectStore store;
@@ -105,6 +107,7 @@ public:
     VtTSceneServices services;
     VtCScene3D* scene = nullptr;
     bool modified = false;
+    int modifications = 0; ///< how often it was told so
 };
 
 /// A unit cube, from (-0.5, -0.5, -0.5) to (0.5, 0.5, 0.5), as one drawable with a material of its own and, if asked

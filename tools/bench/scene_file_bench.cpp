@@ -11,6 +11,7 @@
 
 #include "base/Paths.h"
 #include "base/Text.h"
+#include "records/AttributeNames.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
 #include "scene/StaticBody.h"
@@ -50,8 +51,8 @@ void Build(VtISceneDocument& document, VtCScene3D& scene, const std::vector<std:
         else
             body = new VtC3DStaticBody(document, *scene.GetStaticBodies(), name, model, osg::Matrixd(), true, L"");
         const auto number = static_cast<float>(i);
-        body->GetAttributeObject()->Write(L"position", VtTFloatTupel3{number, -number, 0.5F});
-        body->GetAttributeObject()->Write(L"rotation", VtTFloatTupel3{0, 0, 0.1F * number});
+        body->GetAttributeObject()->Write(attribute::position, VtTFloatTupel3{number, -number, 0.5F});
+        body->GetAttributeObject()->Write(attribute::rotation, VtTFloatTupel3{0, 0, 0.1F * number});
     }
 }
 

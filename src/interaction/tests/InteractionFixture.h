@@ -47,6 +47,7 @@ class InteractionFixture : public testing::Test
 protected:
     InteractionFixture()
     {
+        RegisterInteractionAttributes();
         document.texts.known[6221] = L"free|fixed|Fixed_to_Object|heading|smooth|look at|position|along x|along y";
         scene = std::make_unique<VtCScene3D>(document);
         observers = new VtC3DObservers(document, interaction, clock, defaultsFile);

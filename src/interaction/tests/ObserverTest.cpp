@@ -3,7 +3,7 @@
 #include <random>
 
 #include "interaction/tests/InteractionFixture.h"
-#include "scene/EulerAngles.h"
+#include "scene/Placement.h"
 
 namespace
 {

@@ -7,12 +7,15 @@
 #include <sys/resource.h>
 
 #include "records/SceneFileText.h"
+#include "records/tests/SampleTable.h"
 #include "records/tests/SceneFileFixture.h"
 
 using namespace scenefile;
 
 namespace
 {
+
+const bool told = TellSampleTable();
 
 std::string Repeat(const std::string& text, int count)
 {

@@ -27,6 +27,8 @@ class Views : public testing::Test, public VtIInteractionServices
 protected:
     Views()
     {
+        RegisterInteractionAttributes();
+        RegisterViewAttributes();
         VtTViewerServices services;
         services.graphics = &graphics;
         services.clock = &clock;

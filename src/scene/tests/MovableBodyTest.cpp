@@ -2,7 +2,7 @@
 
 #include <osg/ProxyNode>
 
-#include "scene/EulerAngles.h"
+#include "scene/Placement.h"
 #include "scene/tests/SceneFixture.h"
 
 namespace

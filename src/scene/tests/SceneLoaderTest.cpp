@@ -20,7 +20,8 @@ public:
     Observer(VtISceneDocument& owner, const std::wstring& name, std::int32_t type, const std::wstring& id)
         : VtCGlidePanelAbstractNavigatorObject(owner, nullptr, name, true, id)
     {
-        attributeObject = MakeDefaultObject(type);
+        attributeObject = new VtISceneObject(type);
+        WriteAttribute(L"object_type", type);
         WriteAttribute(L"internal_id", GetInternalId());
         PublishAttributes();
     }

@@ -3,7 +3,7 @@
 #include <osg/ProxyNode>
 #include <osg/Stencil>
 
-#include "scene/EulerAngles.h"
+#include "scene/Placement.h"
 #include "scene/tests/SceneFixture.h"
 
 namespace

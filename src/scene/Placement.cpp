@@ -1,8 +1,25 @@
-#include "scene/EulerAngles.h"
+#include "scene/Placement.h"
 
 #include "base/Maths.h"
 
 #include <cmath>
+
+osg::Vec3f FieldFromRecord(const VtTAxes& axes, const VtTFloatTupel3& stored)
+{
+    osg::Vec3f field;
+    for (std::size_t i = 0; i < 3; ++i)
+        field[static_cast<unsigned>(i)] = stored[axes.from[i]] * axes.factor[i];
+    return field;
+}
+
+VtTFloatTupel3 RecordFromField(const VtTAxes& axes, const osg::Vec3f& field)
+{
+    VtTFloatTupel3 stored{};
+    for (std::size_t i = 0; i < 3; ++i)
+        // A turned zero is a zero, not "-0" in the file.
+        stored[axes.from[i]] = field[static_cast<unsigned>(i)] / axes.factor[i] + 0.0F;
+    return stored;
+}
 
 osg::Vec3f EulerAngles(const osg::Quat& rotation)
 {

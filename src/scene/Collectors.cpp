@@ -1,4 +1,6 @@
-#include "scene/MaterialCollector.h"
+#include "scene/Collectors.h"
+
+#include <algorithm>
 
 VtCOsgMatMapObject::VtCOsgMatMapObject(osg::Material& source)
     : material(&source),
@@ -39,4 +41,15 @@ void VtCOsgNodeMaterialCollector::apply(osg::Geode& geode)
             materials[drawable] = new VtCOsgMatMapObject(*material);
     }
     traverse(geode);
+}
+
+void VtCOsgShaderCollector::apply(osg::Node& node)
+{
+    osg::StateSet* stateSet = node.getStateSet();
+    auto* program =
+        stateSet ? dynamic_cast<osg::Program*>(stateSet->getAttribute(osg::StateAttribute::PROGRAM)) : nullptr;
+    const auto known = [&](const auto& entry) { return entry.first == stateSet; };
+    if (program && std::none_of(programs.begin(), programs.end(), known))
+        programs.emplace_back(stateSet, program);
+    traverse(node);
 }
