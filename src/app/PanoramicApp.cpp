@@ -19,6 +19,7 @@
 #include "interaction/Observers.h"
 #include "records/SceneObjectStore.h"
 #include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"

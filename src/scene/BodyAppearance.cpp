@@ -210,6 +210,9 @@ VtTIntTupel3 VtC3DBody::GiveDyeColour() const
 
 void VtC3DBody::TakeDyeEnabled(bool flag)
 {
+    // A stored "no dye" of a body without one must leave the picture as it is.
+    if (flag == (dye->enabled != 0))
+        return;
     dye->enabled = flag ? 1 : 0;
     RefreshAppearance();
 }

@@ -269,17 +269,13 @@ TEST_F(Observer, TakesItsRecord)
 {
     VtC3DObserver& rider = Rider(followFixed);
     const osg::ref_ptr<VtISceneObject> record = rider.GetAttributeObject();
-    record->Write(L"behaviour", followSmooth);
     record->Write(L"attached_to", std::wstring(L"CAR"));
-    record->Write(L"translation", VtTFloatTupel3{1, 2, 3});
-    record->Write(L"rotation", VtTFloatTupel3{10, 20, 30});
-    EXPECT_EQ(rider.GetFollowMode(), followSmooth);
     EXPECT_EQ(rider.GetConnectedBody(), car);
-    EXPECT_EQ(rider.GetTranslationOffset(), osg::Vec3f(1, 2, 3));
-    EXPECT_EQ(rider.GetRotationOffset(), osg::Vec3f(10, 20, 30));
-
     record->Write(L"attached_to", std::wstring(L"nobody"));
     EXPECT_EQ(rider.GetConnectedBody(), car) << "an unknown name changes nothing";
+    EXPECT_EQ(*record->Find<std::wstring>(L"attached_to"), L"Car") << "not even the record";
+    record->Write(L"attached_to", std::wstring(L"Not connected"));
+    EXPECT_EQ(rider.GetConnectedBody(), nullptr);
 
     VtC3DObserver& orphan = Rider(followFixed, L"Orphan");
     orphan.GetAttributeObject()->Write(L"attached_to", std::wstring(L"Lost"));

@@ -23,50 +23,6 @@ class AttributePath : public SceneFixture
 {
 };
 
-TEST_F(AttributePath, AChangeFromOutsideReachesTheBodyOnce)
-{
-    VtC3DMovableBody& body = AddMovable(L"Car");
-    Listener listener;
-    body.GetAttributeObject()->Advise(listener);
-    document.modified = false;
-
-    Write(body, L"name", std::wstring(L"Van"));
-    EXPECT_EQ(body.GetName(), L"Van");
-    EXPECT_TRUE(document.modified);
-    Write(body, L"selectable", 0);
-    EXPECT_FALSE(body.IsSelectable());
-    Write(body, L"fixed_to_world", 1);
-    EXPECT_TRUE(body.IsFixedToWorld());
-    Write(body, L"fixed_to_world", 1);
-    Write(body, L"visible", 0);
-    EXPECT_FALSE(body.IsVisible());
-    EXPECT_EQ(body.GetTransformNode()->getNodeMask(), 0U);
-    Write(body, L"something", std::wstring(L"else"));
-
-    const std::vector<std::wstring> expected = {L"name=Van", L"selectable=0", L"fixed_to_world=1", L"visible=0",
-                                                L"something=else"};
-    EXPECT_EQ(listener.heard, expected);
-    body.GetAttributeObject()->Unadvise(listener);
-}
-
-TEST_F(AttributePath, ABodysOwnWritesReachOthersButNotItself)
-{
-    VtC3DMovableBody& body = AddMovable(L"Car");
-    Listener listener;
-    body.GetAttributeObject()->Advise(listener);
-
-    // Heard by the body itself, the index that is written first would take the given name away again.
-    body.ConnectChannel(5, L"Given");
-    EXPECT_EQ(body.GetSimulationDataStream(), L"Given");
-    EXPECT_EQ(Stored(body, L"simulation_data_index"), L"Given");
-    body.SetVisible(false);
-    body.SetVisible(false);
-    const std::vector<std::wstring> expected = {L"simulation_data_stream=5", L"simulation_data_index=Given",
-                                                L"visible=0"};
-    EXPECT_EQ(listener.heard, expected);
-    body.GetAttributeObject()->Unadvise(listener);
-}
-
 TEST_F(AttributePath, ListenersMayLeaveWhileTheyAreTold)
 {
     VtC3DMovableBody& body = AddMovable(L"Car");
