@@ -103,7 +103,6 @@ public:
     host::OpenedWindow OpenWindow(const host::WindowRequest& request) override;
 
     /// There is no selection to be shown.
-    void SelectObject(const std::wstring&) override {}
 
 private:
     class Frame;

@@ -15,6 +15,7 @@
 #include "hosts/common/IniFile.h"
 #include "hosts/common/IniTexts.h"
 #include "hosts/common/OffscreenViews.h"
+#include "hosts/common/SelectionList.h"
 #include "hosts/common/SystemClock.h"
 #include "hosts/common/SystemPaths.h"
 #include "hosts/console/ConsoleMessages.h"
@@ -72,6 +73,7 @@ public:
     host::Clock& GetClock() override { return clock; }
     host::Texts& GetTexts() override { return texts; }
     host::LibraryPaths& GetLibraryPaths() override { return paths; }
+    host::Selection& GetSelection() override { return selection; }
     host::MainWindow* GetMainWindow() override { return &window; }
     host::Variables* GetVariables() override { return &variables; }
     host::UserInterface* GetUserInterface() override { return nullptr; }
@@ -111,6 +113,7 @@ private:
     ConsoleQuestions questions;
     hosts::EglGraphics graphics;
     hosts::OffscreenViews views{clock};
+    hosts::SelectionList selection; // documents take their objects out of it
     hosts::DocumentList documents;
 };
 

@@ -12,6 +12,7 @@
 #include "hosts/common/IdleLoop.h"
 #include "hosts/common/IniFile.h"
 #include "hosts/common/IniTexts.h"
+#include "hosts/common/SelectionList.h"
 #include "hosts/common/SystemPaths.h"
 #include "hosts/desktop/controller/PropertySheets.h"
 #include "hosts/desktop/FileQuestions.h"
@@ -65,6 +66,7 @@ public:
     host::Clock& GetClock() override { return clock; }
     host::Texts& GetTexts() override { return texts; }
     host::LibraryPaths& GetLibraryPaths() override { return paths; }
+    host::Selection& GetSelection() override { return selection; }
     host::MainWindow* GetMainWindow() override { return window; }
     host::Variables* GetVariables() override { return &variables; }
     host::UserInterface* GetUserInterface() override { return window; }
@@ -106,6 +108,7 @@ private:
     FileQuestions questions;
     PropertySheets sheets;
     PaneGraphics graphics;
+    hosts::SelectionList selection; // documents take their objects out of it
     hosts::DocumentList documents;
     WindowServices* window = nullptr;
     host::ViewWindows* viewWindows = nullptr;

@@ -73,8 +73,7 @@ MainWindow::MainWindow(DesktopHost& desktopHost, VtCPanoramicApp& application)
               }),
       state(desktopHost.GetStateFile(), desktopHost.GetMessages()),
       files(application, desktopHost, state, *this, [this] { UpdateTitle(); }),
-      sceneWindows(
-          *this, [this](ViewArea* area) { Place(area); }, [this](const std::wstring& id) { Select(id); })
+      sceneWindows(*this, [this](ViewArea* area) { Place(area); })
 {
     setObjectName("main");
     setWindowIcon(MakeIcon("panoramic"));
@@ -92,10 +91,14 @@ MainWindow::MainWindow(DesktopHost& desktopHost, VtCPanoramicApp& application)
     host.GetFileQuestions().SetWindow(this);
     BuildLog();
     BuildStatusLine();
+    host.GetSelection().AddListener(*this);
+    app.AddSceneListener(*this);
 }
 
 MainWindow::~MainWindow()
 {
+    app.RemoveSceneListener(*this);
+    host.GetSelection().RemoveListener(*this);
     host.GetMessages().SetLog({});
     host.GetMessages().SetWindow(nullptr);
     host.GetProgressBox().SetWindow(nullptr);
@@ -283,25 +286,37 @@ void MainWindow::Place(ViewArea* area)
 {
     if (area)
         middle->layout()->addWidget(area);
-    else
-        Select({});
 }
 
-void MainWindow::Select(const std::wstring& id)
+void MainWindow::SelectionChanged()
 {
-    selectedId = id;
     const std::wstring name = GetSelectedName();
     selection->setText(name.empty() ? QString() : ToQt(hosts::IniTexts::Format(texts, textSelected, name, {})));
 }
 
+void MainWindow::ObjectRenamed(VtCGlidePanelAbstractNavigatorObject& object, const std::wstring&)
+{
+    if (host.GetSelection().IsSelected(object.GetInternalId()))
+        SelectionChanged();
+}
+
+void MainWindow::ActiveViewChanged(VtCBase3DView*, VtCGlidePanelAbstractNavigatorObject*)
+{
+    if (sceneWindows.GetArea())
+        sceneWindows.GetArea()->update();
+}
+
+std::wstring MainWindow::GetSelectedId() const
+{
+    const std::vector<std::wstring>& selected = host.GetSelection().GetSelection();
+    return selected.empty() ? std::wstring() : selected.back();
+}
+
 std::wstring MainWindow::GetSelectedName() const
 {
-    const VtCScene3D* scene = selectedId.empty() ? nullptr : app.GetActiveScene();
-    if (!scene)
-        return {};
-    const VtCGlidePanelAbstractNavigatorObject* object = scene->GetStaticBodies()->FindById(selectedId);
-    for (std::int32_t i = 0; !object && i < scene->GetMovableBodiesCount(); ++i)
-        object = scene->GetMovableBodies(i)->FindById(selectedId);
+    const VtCScene3D* scene = app.GetActiveScene();
+    const VtCGlidePanelAbstractNavigatorObject* object =
+        scene ? scene->GetObjects().FindById(GetSelectedId()) : nullptr;
     return object ? object->GetName() : std::wstring();
 }
 
@@ -309,13 +324,6 @@ void MainWindow::Refresh()
 {
     actions.Refresh();
     setWindowModified(files.IsModified());
-    const VtCChildFrame* frame = GetChildFrame();
-    const void* active = frame ? frame->GetActiveView() : nullptr;
-    if (active != markedView && sceneWindows.GetArea())
-    {
-        markedView = active;
-        sceneWindows.GetArea()->update();
-    }
 }
 
 void MainWindow::UpdateTitle()

@@ -6,12 +6,14 @@
 #include <QMainWindow>
 #include <QTimer>
 
+#include "host/Selection.h"
 #include "hosts/desktop/CommandActions.h"
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/SceneFiles.h"
 #include "hosts/desktop/SceneWindows.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/ViewArea.h"
+#include "scene/SceneObjects.h"
 
 class QDockWidget;
 class QLabel;
@@ -29,7 +31,11 @@ class ControllerDock;
 /// The one main window: menus, tool bars, the scene's panes in the middle, docks around it and the status line.
 ///
 /// It carries no rule of the component: its widgets show what that tells, and send commands by their number.
-class MainWindow : public QMainWindow, public WindowServices, public ViewSurroundings
+class MainWindow : public QMainWindow,
+                   public WindowServices,
+                   public ViewSurroundings,
+                   private host::SelectionListener,
+                   private VtISceneListener
 {
 public:
     /// The services of the window are there from now on; menus and docks come with `Build`.
@@ -46,7 +52,9 @@ public:
     CommandActions& GetActions() { return actions; }
     const CommandActions& GetActions() const { return actions; }
     const ViewArea* GetViewArea() const { return sceneWindows.GetArea(); }
-    const std::wstring& GetSelectedId() const { return selectedId; }
+
+    /// Of the object selected last; empty when nothing is.
+    std::wstring GetSelectedId() const;
     std::wstring GetSelectedName() const;
 
     std::int32_t GetWindowState() const override;
@@ -84,7 +92,11 @@ private:
     void RestorePlaces();
     void StorePlaces();
     void Place(ViewArea* area);
-    void Select(const std::wstring& id);
+
+    // What is selected and active shows as soon as it changes.
+    void SelectionChanged() override;
+    void ObjectRenamed(VtCGlidePanelAbstractNavigatorObject& object, const std::wstring& formerName) override;
+    void ActiveViewChanged(VtCBase3DView* view, VtCGlidePanelAbstractNavigatorObject* observer) override;
     void Refresh();
     void UpdateTitle();
     void FillSourceMenu();
@@ -119,11 +131,9 @@ private:
     QLabel* frameRate = nullptr;
     QLabel* source = nullptr;
     QLabel* selection = nullptr;
-    std::wstring selectedId;
     QTimer refreshTimer;
     QTimer storeTimer;
     bool built = false;
-    const void* markedView = nullptr; ///< the active view as last marked; compared only
 };
 
 } // namespace desktop

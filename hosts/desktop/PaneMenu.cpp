@@ -11,6 +11,7 @@
 #include "render/ChildFrame.h"
 #include "render/PanoramicView.h"
 #include "render/ViewCommandsHandler.h"
+#include "scene/ObjectHandle.h"
 
 namespace desktop
 {
@@ -22,20 +23,21 @@ QMenu* MakePaneMenu(QWidget& parent, VtCPanoramicDocument& document, VtCPanorami
     menu->setAttribute(Qt::WA_DeleteOnClose);
     menu->addSection(ToQt(view.getName()) + " - " + Part(texts, textObserver, 0));
     auto* group = new QActionGroup(menu);
-    for (const VtC3DObserver* observer : document.GetObservers().GetObservers())
+    for (VtC3DObserver* observer : document.GetObservers().GetObservers())
     {
         QAction* choice = menu->addAction(ToQt(observer->GetName()).replace('&', "&&"));
         choice->setCheckable(true);
         choice->setChecked(view.getObserver() == observer);
         choice->setStatusTip(Part(texts, textObserver, 1));
         group->addAction(choice);
-        // By its name and the pane's number: the scene may have changed by the time the choice is made.
+        // The observer may have gone by the time the choice is made.
         QObject::connect(choice, &QAction::triggered, menu,
-                         [&document, name = observer->GetName(), pane = view.getViewPosition()]
+                         [&document, handle = VtCObjectHandle<VtC3DObserver>(observer), pane = view.getViewPosition()]
                          {
                              VtCChildFrame* frame = document.GetChildFrame();
                              VtCPanoramicView* chosen = frame ? frame->getSplitter().getView(pane) : nullptr;
-                             if (chosen && chosen->assignObserverByName(name))
+                             const VtC3DObserver* present = handle.Get();
+                             if (chosen && present && chosen->assignObserverByName(present->GetName()))
                                  document.SetModified(true);
                          });
     }

@@ -53,9 +53,8 @@ private:
     std::map<std::uint32_t, std::unique_ptr<QTimer>> timers;
 };
 
-SceneWindows::SceneWindows(ViewSurroundings& programAround, std::function<void(ViewArea*)> placeArea,
-                           std::function<void(const std::wstring&)> selectObject)
-    : surroundings(programAround), place(std::move(placeArea)), select(std::move(selectObject))
+SceneWindows::SceneWindows(ViewSurroundings& programAround, std::function<void(ViewArea*)> placeArea)
+    : surroundings(programAround), place(std::move(placeArea))
 {
 }
 

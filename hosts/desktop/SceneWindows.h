@@ -15,13 +15,12 @@ namespace desktop
 class ViewArea;
 class ViewSurroundings;
 
-/// Makes the window of a scene in the middle of the main window, and tells on what is selected.
+/// Makes the window of a scene in the middle of the main window.
 class SceneWindows : public host::ViewWindows
 {
 public:
-    /// `place` shows the window of a scene it is given, null when it goes. `select` gets the id of the selected object.
-    SceneWindows(ViewSurroundings& programAround, std::function<void(ViewArea*)> place,
-                 std::function<void(const std::wstring&)> select);
+    /// `place` shows the window of a scene it is given, null when it goes.
+    SceneWindows(ViewSurroundings& programAround, std::function<void(ViewArea*)> placeArea);
 
     /// The grid of the scene that is open; null while there is none.
     ViewArea* GetArea() const;
@@ -30,14 +29,12 @@ public:
 
     /// Refused: the main window with its panes is the only one that this program shows a scene in.
     host::OpenedWindow OpenWindow(const host::WindowRequest& request) override;
-    void SelectObject(const std::wstring& internalId) override { select(internalId); }
 
 private:
     class Frame;
 
     ViewSurroundings& surroundings;
     std::function<void(ViewArea*)> place;
-    std::function<void(const std::wstring&)> select;
     QPointer<ViewArea> area;
 };
 

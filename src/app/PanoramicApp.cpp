@@ -294,6 +294,20 @@ VtCScene3D* VtCPanoramicApp::GetActiveScene() const
     return document ? document->GetScene() : nullptr;
 }
 
+void VtCPanoramicApp::AddSceneListener(VtISceneListener& listener)
+{
+    sceneListeners.push_back(&listener);
+    if (VtCScene3D* scene = GetActiveScene())
+        scene->GetObjects().AddListener(listener);
+}
+
+void VtCPanoramicApp::RemoveSceneListener(VtISceneListener& listener)
+{
+    std::erase(sceneListeners, &listener);
+    if (VtCScene3D* scene = GetActiveScene())
+        scene->GetObjects().RemoveListener(listener);
+}
+
 VtCBase3DView* VtCPanoramicApp::GetActiveView() const
 {
     const VtCPanoramicDocument* document = GetActiveDocument();

@@ -29,6 +29,7 @@ class VtCSceneObjectStore;
 class VtCSimulationDataController;
 class VtCSimulationDataControllerDialog;
 class VtCSimulationDataCustomizeSheet;
+class VtISceneListener;
 struct VtTMenuState;
 struct VtTSceneServices;
 
@@ -103,6 +104,12 @@ public:
     VtCPanoramicDocument* GetActiveDocument() const;
     VtCScene3D* GetActiveScene() const override;
 
+    /// `listener` (not owned) hears of the scene of every document: of the active one from now on, of later ones from
+    /// their first object on.
+    void AddSceneListener(VtISceneListener& listener);
+    void RemoveSceneListener(VtISceneListener& listener);
+    const std::vector<VtISceneListener*>& GetSceneListeners() const { return sceneListeners; }
+
     /// The view that has the focus in the active document; null in a host without windows for views.
     VtCBase3DView* GetActiveView() const;
     VtIInstrumentFeed* GetActiveInstruments() const override;
@@ -175,6 +182,8 @@ private:
     std::unique_ptr<VtCSimulationDataController> controller;
     std::unique_ptr<VtCSimulationDataCustomizeSheet> customizeSheet;
     std::unique_ptr<VtCSimulationDataControllerDialog> controllerDialog;
+
+    std::vector<VtISceneListener*> sceneListeners;
 
     bool multisampling = false;
     std::uint32_t mouseSensitivity = 5;

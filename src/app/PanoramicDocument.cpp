@@ -6,9 +6,11 @@
 #include "app/DayLight.h"
 #include "app/GraphicsSession.h"
 #include "app/PanoramicApp.h"
+#include "app/SceneLoader.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "host/Host.h"
+#include "host/Selection.h"
 #include "host/ViewWindows.h"
 #include "interaction/MouseInput.h"
 #include "interaction/Observers.h"
@@ -45,6 +47,9 @@ VtCPanoramicDocument::VtCPanoramicDocument(VtCPanoramicApp& application) : app(a
     if (!graphicsSession)
         graphicsSession = std::make_unique<VtCGraphicsSession>();
     ownedScene = std::make_unique<VtCScene3D>(*this);
+    scene->GetObjects().AddListener(*this);
+    for (VtISceneListener* listener : app.GetSceneListeners())
+        scene->GetObjects().AddListener(*listener);
     AddDayLight(*scene->GetEnvironmentNode());
 
     observers = new VtC3DObservers(*this, *this, app.GetHost().GetClock(),
@@ -58,6 +63,10 @@ VtCPanoramicDocument::VtCPanoramicDocument(VtCPanoramicApp& application) : app(a
 
     mouseInputManager = std::make_unique<VtCMouseInputManager>();
     MakeChildFrame();
+    RegisterSceneRecords(builders);
+    RegisterObserverRecords(builders, *observers);
+    if (childFrame)
+        RegisterViewRecords(builders, *childFrame);
     SetModifiedFlag(false);
 }
 
@@ -86,6 +95,7 @@ void VtCPanoramicDocument::MakeChildFrame()
                                                               .interaction = *this,
                                                               .mouseInputManager = *mouseInputManager,
                                                               .windows = *windows,
+                                                              .selection = app.GetHost().GetSelection(),
                                                               .clock = app.GetHost().GetClock(),
                                                               .disconnectIdle = [this] { app.DisconnectIdleSink(); },
                                                               .connectIdle = [this] { app.ConnectIdleSink(); }});
@@ -118,7 +128,7 @@ bool VtCPanoramicDocument::OnOpenDocument(const std::wstring& path)
         app.GetMessageHandler().ShowError(messageSceneNotReadable, Shown(path), reason);
         return false;
     }
-    scene->ResolveObserverTargets();
+    observers->ResolveTargets();
     SetModifiedFlag(false);
     if (childFrame)
         childFrame->startViewCreation();
@@ -134,7 +144,7 @@ bool VtCPanoramicDocument::LoadScene(const std::wstring& path, std::wstring& rea
     }
     try
     {
-        if (scene->LoadSceneFile(path, false))
+        if (VtCSceneLoader(*scene, builders).Load(path))
             return true;
         reason = scene->GetFileError();
     }
@@ -154,6 +164,12 @@ bool VtCPanoramicDocument::OnSaveDocument(const std::wstring& path)
     }
     app.GetMessageHandler().ShowError(messageNotSaved, Shown(path), scene->GetFileError());
     return false;
+}
+
+void VtCPanoramicDocument::ObjectRemoved(VtCGlidePanelAbstractNavigatorObject& object)
+{
+    if (!scene->GetObjects().FindById(object.GetInternalId()))
+        app.GetHost().GetSelection().RemoveFromSelection(object.GetInternalId());
 }
 
 VtTSceneServices& VtCPanoramicDocument::GetServices()

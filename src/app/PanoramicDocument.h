@@ -5,6 +5,8 @@
 
 #include "host/Documents.h"
 #include "interaction/InteractionServices.h"
+#include "scene/RecordBuilders.h"
+#include "scene/SceneObjects.h"
 #include "scene/SceneServices.h"
 
 class VtC3DObservers;
@@ -17,7 +19,10 @@ class VtCSimulationDataReceiver;
 /// it. The host's document manager owns it.
 ///
 /// A new one has an empty scene. A different scene is a different document.
-class VtCPanoramicDocument : public host::ManagedDocument, public VtISceneDocument, private VtIInteractionServices
+class VtCPanoramicDocument : public host::ManagedDocument,
+                             public VtISceneDocument,
+                             private VtIInteractionServices,
+                             private VtISceneListener
 {
 public:
     /// File beside the program with the observers that a new model is given.
@@ -56,6 +61,9 @@ private:
     void SetHeadLightPosition(const osg::Vec3f&) override {} // the head light stands at the eye of each view
     void ReplaceObserverInViews(const VtC3DObserver& gone, VtC3DObserver& substitute) override;
 
+    /// What has gone isn't selected any more.
+    void ObjectRemoved(VtCGlidePanelAbstractNavigatorObject& object) override;
+
     void MakeChildFrame();
     bool LoadScene(const std::wstring& path, std::wstring& reason);
 
@@ -65,5 +73,6 @@ private:
     VtC3DObservers* observers = nullptr; ///< one reference
     std::unique_ptr<VtCMouseInputManager> mouseInputManager;
     std::unique_ptr<VtCChildFrame> childFrame;
+    VtCRecordBuilders builders; ///< those of this scene's observers and views among them
     std::unique_ptr<VtCSimulationDataReceiver> receiver;
 };

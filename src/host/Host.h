@@ -13,6 +13,7 @@ class MessageService;
 class Progress;
 class PropertySheets;
 class Questions;
+class Selection;
 class Settings;
 class Texts;
 class UserInterface;
@@ -31,6 +32,7 @@ public:
     virtual Clock& GetClock() = 0;
     virtual Texts& GetTexts() = 0;
     virtual LibraryPaths& GetLibraryPaths() = 0;
+    virtual Selection& GetSelection() = 0;
 
     virtual MainWindow* GetMainWindow() = 0;
     virtual Variables* GetVariables() = 0;

@@ -111,7 +111,7 @@ struct OpenedWindow
     std::wstring refusal;
 };
 
-/// Makes the windows of scenes, and keeps what is selected.
+/// Makes the windows of scenes.
 class ViewWindows
 {
 public:
@@ -121,9 +121,6 @@ public:
 
     /// A window of a kind that this host can't open is refused, and nothing else is opened in its place.
     virtual OpenedWindow OpenWindow(const WindowRequest& request) = 0;
-
-    /// Selects the object with that `internal_id` in the host, alone.
-    virtual void SelectObject(const std::wstring& internalId) = 0;
 };
 
 } // namespace host

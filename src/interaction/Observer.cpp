@@ -65,7 +65,8 @@ VtTFloatTupel3 RecordFromOrientation(const osg::Quat& orientation)
 } // namespace
 
 VtC3DObserver::VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection,
-                             const std::wstring& name, bool inTree, bool freeByBirth, const std::wstring& id)
+                             const std::wstring& name, bool inTree, bool freeByBirth, const std::wstring& id,
+                             VtEBirth birth)
     : VtC3DBody(owningDocument, &parentCollection, name, {}, inTree, freeByBirth ? name : id),
       collection(parentCollection),
       isFreeByBirth(freeByBirth),
@@ -75,6 +76,8 @@ VtC3DObserver::VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& p
     Place({offsetTranslation, osg::Quat()});
     MakeRecord();
     PublishAttributes();
+    if (birth == VtEBirth::complete)
+        EnterScene();
 }
 
 VtC3DObserver::~VtC3DObserver()

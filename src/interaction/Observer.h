@@ -31,7 +31,7 @@ public:
     /// Belongs to `parent`. A free observer has a record of its own kind (type 9) and its name as its id; any other
     /// gets `id`, or a fresh one when that is empty.
     VtC3DObserver(VtISceneDocument& owningDocument, VtC3DObservers& parentCollection, const std::wstring& name,
-                  bool inTree, bool freeByBirth, const std::wstring& id);
+                  bool inTree, bool freeByBirth, const std::wstring& id, VtEBirth birth = VtEBirth::complete);
 
     /// The frame cycle's step: the placement for where the body is now, pushed to the cameras. Nothing while no view
     /// looks through it.
@@ -107,8 +107,12 @@ public:
     /// Forgets the followed rotations of an earlier run.
     void ClearFollower() { follower.Clear(); }
 
-    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
-    void FinishLoad(const std::wstring& id) { RebindAttributes(id); }
+    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`. It is complete then.
+    void FinishLoad(const std::wstring& id)
+    {
+        RebindAttributes(id);
+        EnterScene();
+    }
 
     void ApplyAttributes(VtISceneObject& source) override;
     /// What the record of a free observer (type 9), or of any other, holds. Names in any case.

@@ -47,29 +47,38 @@ VtC3DObservers::VtC3DObservers(VtISceneDocument& owningDocument, VtIInteractionS
       defaultObservers(std::move(defaultsFile)),
       followModeNames(base::Split(owningDocument.GetServices().texts.GetText(textFollowModes), L'|'))
 {
+    if (VtCSceneObjects* objects = GetSceneObjects())
+        objects->AddListener(*this);
 }
 
-VtC3DObservers::~VtC3DObservers() = default;
+VtC3DObservers::~VtC3DObservers()
+{
+    if (VtCSceneObjects* objects = GetSceneObjects())
+        objects->RemoveListener(*this);
+    LeaveScene();
+}
 
 void VtC3DObservers::CreateFreeObservers()
 {
     const auto make = [this](const wchar_t* name)
     {
-        auto* observer = new VtC3DObserver(GetDocument(), *this, name, true, true, {});
+        auto* observer = new VtC3DObserver(GetDocument(), *this, name, true, true, {}, VtEBirth::stepsFollow);
         observer->SetFollowModeIndex(followFree);
+        observer->EnterScene();
         return observer;
     };
     free1 = make(L"Free1");
     free2 = make(L"Free2");
 }
 
-VtC3DObserver& VtC3DObservers::CreateObserver(const std::wstring& name, bool inTree, const std::wstring& id)
+VtC3DObserver& VtC3DObservers::CreateObserver(const std::wstring& name, bool inTree, const std::wstring& id,
+                                              VtEBirth birth)
 {
     std::wstring used = name;
     for (int number = 1; used.empty(); ++number)
         if (const std::wstring candidate = L"Observer_" + std::to_wstring(number); !FindObserverByName(candidate))
             used = candidate;
-    auto* observer = new VtC3DObserver(GetDocument(), *this, used, inTree, false, id);
+    auto* observer = new VtC3DObserver(GetDocument(), *this, used, inTree, false, id, birth);
     GetDocument().SetModified(true);
     return *observer;
 }
@@ -133,49 +142,11 @@ void VtC3DObservers::UpdateObservers()
         ChildAt(i)->Update();
 }
 
-void VtC3DObservers::ReleaseBody(VtC3DMovableBody& body)
+void VtC3DObservers::ObjectRemoved(VtCGlidePanelAbstractNavigatorObject& object)
 {
     for (VtC3DObserver* observer : GetObservers())
-        if (observer->GetConnectedBody() == &body)
+        if (observer->GetConnectedBody() == &object)
             observer->Disconnect();
-}
-
-VtCGlidePanelAbstractNavigatorObject* VtC3DObservers::GetDefaultObserver(int index) const
-{
-    return index == 0 ? free1 : free2;
-}
-
-VtCGlidePanelAbstractNavigatorObject& VtC3DObservers::MakeObserver(const std::wstring& name, const std::wstring& id)
-{
-    return CreateObserver(name, true, id);
-}
-
-std::vector<VtTMissingTarget> VtC3DObservers::GetMissingTargets() const
-{
-    std::vector<VtTMissingTarget> missing;
-    for (VtC3DObserver* observer : GetObservers())
-    {
-        const std::wstring body = observer->GetConnectedBodyName();
-        if (IsFreeObserver(*observer) || observer->GetConnectedBody() || body.empty())
-            continue;
-        auto at =
-            std::find_if(missing.begin(), missing.end(),
-                         [&](const VtTMissingTarget& target) { return base::EqualsNoCase(target.bodyName, body); });
-        if (at == missing.end())
-            at = missing.insert(missing.end(), {body, {}});
-        at->observers.push_back(observer);
-    }
-    return missing;
-}
-
-void VtC3DObservers::SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody& body)
-{
-    for (VtC3DObserver* observer : GetObservers())
-    {
-        if (std::find(missing.observers.begin(), missing.observers.end(), observer) == missing.observers.end())
-            continue;
-        observer->SetConnectedBody(&body);
-    }
 }
 
 void VtC3DObservers::ClearFollowers()
@@ -239,7 +210,7 @@ void VtC3DObservers::LoadDefaultObservers(const std::wstring& modelName)
     std::vector<VtC3DObserver*> made;
     for (int number = 1, status = 0; status == VtISettingsReader::found; ++number)
     {
-        VtC3DObserver& observer = CreateObserver({}, true);
+        VtC3DObserver& observer = CreateObserver({}, true, {}, VtEBirth::stepsFollow);
         status = observer.LoadSettings(L"OBSERVER_" + std::to_wstring(number), *reader);
         if (status != VtISettingsReader::found)
         {
@@ -250,6 +221,8 @@ void VtC3DObservers::LoadDefaultObservers(const std::wstring& modelName)
         made.push_back(&observer);
     }
     MakeNamesDistinct(made);
+    for (VtC3DObserver* observer : made)
+        observer->EnterScene();
 }
 
 void VtC3DObservers::MakeNamesDistinct(const std::vector<VtC3DObserver*>& made)

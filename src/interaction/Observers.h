@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "scene/AbstractNavigatorObject.h"
-#include "scene/SceneParts.h"
+#include "scene/SceneObjects.h"
 #include "scene/SceneServices.h"
 
 namespace host
@@ -16,12 +16,13 @@ class Clock;
 }
 class VtC3DMovableBody;
 class VtC3DObserver;
+class VtCRecordBuilders;
 class VtIInteractionServices;
 class VtISettingsReader;
 
 /// The observers of a scene. Two of them, "Free1" and "Free2", can't be removed. All names are compared without regard
 /// to case.
-class VtC3DObservers : public VtCGlidePanelAbstractNavigatorObject, public VtISceneObservers, public VtIObserverRecords
+class VtC3DObservers : public VtCGlidePanelAbstractNavigatorObject, public VtISceneObservers, private VtISceneListener
 {
 public:
     /// `defaultsFile` holds the observers that a new model is given; it need not exist.
@@ -37,7 +38,8 @@ public:
     bool IsFreeObserver(const VtC3DObserver& observer) const { return &observer == free1 || &observer == free2; }
 
     /// An empty name becomes "Observer_%i" with the smallest free number from 1 up; an empty id a fresh one.
-    VtC3DObserver& CreateObserver(const std::wstring& name, bool inTree, const std::wstring& id = {});
+    VtC3DObserver& CreateObserver(const std::wstring& name, bool inTree, const std::wstring& id = {},
+                                  VtEBirth birth = VtEBirth::complete);
 
     /// False when there is none of that name. A view that looks through it isn't switched.
     bool RemoveObserver(std::wstring_view name);
@@ -52,15 +54,10 @@ public:
     std::vector<VtC3DObserver*> GetObservers() const;
 
     void UpdateObservers() override;
-    void ReleaseBody(VtC3DMovableBody& body) override;
-
-    VtIObserverRecords* GetRecords() override { return this; }
-    VtCGlidePanelAbstractNavigatorObject* GetDefaultObserver(int index) const override;
-    VtCGlidePanelAbstractNavigatorObject& MakeObserver(const std::wstring& name, const std::wstring& id) override;
-    std::vector<VtTMissingTarget> GetMissingTargets() const override;
-    void SetTarget(const VtTMissingTarget& missing, VtC3DMovableBody& body) override;
-
     void ClearFollowers() override;
+
+    /// Has the user choose bodies for the observers whose body is missing. Nothing without a user.
+    void ResolveTargets();
 
     const std::vector<std::wstring>& GetFollowModeNames() const { return followModeNames; }
 
@@ -87,6 +84,9 @@ protected:
     ~VtC3DObservers() override;
 
 private:
+    /// Of a body: observers that ride on it stay where they are, not connected.
+    void ObjectRemoved(VtCGlidePanelAbstractNavigatorObject& object) override;
+
     VtC3DObserver* ChildAt(std::size_t index) const;
     void MakeNamesDistinct(const std::vector<VtC3DObserver*>& made);
     void LoadFreeObserver(VtC3DObserver* observer, int number, const VtISettingsReader& reader);
@@ -101,3 +101,6 @@ private:
 
 /// Tells the tables of this folder: observers.
 void RegisterInteractionAttributes();
+
+/// The builders of observers and default observers. `observers` outlives `builders`.
+void RegisterObserverRecords(VtCRecordBuilders& builders, VtC3DObservers& observers);

@@ -28,7 +28,7 @@ enum class VtEPickCode : std::int32_t
 ///
 ///     const VtCPick pick(view, 120, 80);        // pixels from the lower left corner
 ///     if (const VtC3DBody* body = pick.GetBody())
-///         windows.SelectObject(body->GetInternalId());
+///         selection.SelectOnly(body->GetInternalId());
 ///
 /// The hits stand nearest first. Each is looked at from its leaf to the root, and the first node with a
 /// `VtCOsgUserData` names its object. Hidden bodies aren't met, and neither are lines, such as those of a selection

@@ -36,6 +36,12 @@ void RegisterAttributeTable(const VtCAttributeTable& table);
 /// By their object types.
 const std::vector<const VtCAttributeTable*>& GetAttributeTables();
 
+/// False for a type of a later version, or of nobody.
+inline bool IsKnownObjectType(std::int32_t type)
+{
+    return type >= objectTypeAtmospherics && type <= objectTypeDefaultObserver;
+}
+
 /// The type that every record gives an attribute of that name; nothing for names that aren't fixed.
 std::optional<VtEAttributeType> FixedAttributeType(std::wstring_view name);
 

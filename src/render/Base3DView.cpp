@@ -113,6 +113,7 @@ void VtCBase3DView::assignObserver(VtC3DObserver* newObserver)
         observer->PushViewMatrix();
     }
     valueChanged(attribute::observer);
+    frame.ObserverAssigned(*this);
 }
 
 VtCOsgCameramanipulator* VtCBase3DView::GetManipulator() const

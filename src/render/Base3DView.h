@@ -47,6 +47,9 @@ public:
     /// Selects a body in the host.
     virtual void SelectBody(const VtC3DBody& body) = 0;
 
+    /// `view` looks through another observer now.
+    virtual void ObserverAssigned(const VtCBase3DView& view) = 0;
+
     /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want
     /// one. 0 lets the active pane fill the frame.
     virtual void ApplyLayout(std::int32_t layout) = 0;

@@ -2,6 +2,7 @@
 
 #include "base/Text.h"
 #include "host/Clock.h"
+#include "host/Selection.h"
 #include "host/ViewWindows.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/MouseInput.h"
@@ -40,14 +41,12 @@ VtCChildFrame::VtCChildFrame(VtTChildFrameServices frameServices)
     createViewer();
     splitter = std::make_unique<VtCSplitterEx>(*this, window->GetSplitter());
     GiveDefaultObservers();
-    if (VtCScene3D* scene = services.document.GetScene())
-        scene->SetViews(this);
 }
 
 VtCChildFrame::~VtCChildFrame()
 {
-    if (VtCScene3D* scene = services.document.GetScene(); scene && scene->GetViews() == this)
-        scene->SetViews(nullptr);
+    if (VtCScene3D* scene = services.document.GetScene())
+        scene->SetActiveView(nullptr, nullptr);
     window->KillTimer(creationTimer);
     activeView = nullptr;
     splitter.reset();
@@ -127,6 +126,14 @@ void VtCChildFrame::activateView(VtCBase3DView& view)
 {
     services.mouseInputManager.setActiveInput(view.getMouseInput());
     activeView = &view;
+    ObserverAssigned(view);
+}
+
+void VtCChildFrame::ObserverAssigned(const VtCBase3DView& view)
+{
+    VtCScene3D* scene = services.document.GetScene();
+    if (scene && &view == activeView)
+        scene->SetActiveView(activeView, activeView->getObserver());
 }
 
 void VtCChildFrame::ForgetView(const VtCBase3DView& view)
@@ -136,6 +143,8 @@ void VtCChildFrame::ForgetView(const VtCBase3DView& view)
     activeView = nullptr;
     if (VtCPanoramicView* first = splitter ? splitter->getView(1) : nullptr)
         activateView(*first);
+    else if (VtCScene3D* scene = services.document.GetScene())
+        scene->SetActiveView(nullptr, nullptr);
 }
 
 VtCPanoramicView* VtCChildFrame::GetActivePane() const
@@ -177,7 +186,7 @@ void VtCChildFrame::ActivateObserver()
 
 void VtCChildFrame::SelectBody(const VtC3DBody& body)
 {
-    services.windows.SelectObject(body.GetInternalId());
+    services.selection.SelectOnly(body.GetInternalId());
 }
 
 void VtCChildFrame::ApplyLayout(std::int32_t layout)

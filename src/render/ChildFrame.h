@@ -5,15 +5,16 @@
 
 #include "render/Base3DView.h"
 #include "render/SplitterEx.h"
-#include "scene/SceneParts.h"
 
 namespace host
 {
 class ChildFrameWindow;
 class Clock;
+class Selection;
 class ViewWindows;
 } // namespace host
 class VtCMouseInputManager;
+class VtCRecordBuilders;
 class VtCVisualizationViewCommandsHandler;
 
 /// What a child frame needs of the application.
@@ -24,6 +25,7 @@ struct VtTChildFrameServices
     VtIInteractionServices& interaction;
     VtCMouseInputManager& mouseInputManager;
     host::ViewWindows& windows;
+    host::Selection& selection;
     host::Clock& clock;
     std::function<void()> disconnectIdle; ///< suspends the frame cycle
     std::function<void()> connectIdle;    ///< resumes it
@@ -33,7 +35,7 @@ struct VtTChildFrameServices
 ///
 /// The windows come first and are drawn to only when the creation timer has fired; until then rendering is held back.
 /// Gone before the document's observers and scene.
-class VtCChildFrame : public VtIViewFrame, public VtISceneViews
+class VtCChildFrame : public VtIViewFrame
 {
 public:
     explicit VtCChildFrame(VtTChildFrameServices frameServices);
@@ -77,12 +79,21 @@ public:
     void activateView(VtCBase3DView& view) override;
     VtCBase3DView* GetActiveView() const override { return activeView; }
     void ForgetView(const VtCBase3DView& view) override;
+    void ObserverAssigned(const VtCBase3DView& view) override;
     void SelectBody(const VtC3DBody& body) override;
     void ApplyLayout(std::int32_t layout) override;
 
-    void ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id) override;
-    void ApplyLayoutRecord(const std::wstring& id) override { splitter->ApplyLayoutRecord(id); }
-    void ActivateObserver() override;
+    // Stored records (`RegisterViewRecords`).
+
+    /// The view of pane 1 to 4 takes the values of `record` and then the record itself, which the store holds under
+    /// `id`. Nothing for other panes.
+    void ApplyViewRecord(std::int32_t pane, VtISceneObject& record, const std::wstring& id);
+
+    /// The splitter takes over the layout record that the store holds under `id`, and its position.
+    void ApplyLayoutRecord(const std::wstring& id) { splitter->ApplyLayoutRecord(id); }
+
+    /// Marks the observer of the active view as looked through, and takes the head light there.
+    void ActivateObserver();
 
 private:
     void GiveDefaultObservers();
@@ -97,3 +108,6 @@ private:
     bool viewsCreated = false;
     bool frameHidden = false;
 };
+
+/// The builders of views and window layout. `frame` outlives `builders`.
+void RegisterViewRecords(VtCRecordBuilders& builders, VtCChildFrame& frame);

@@ -6,6 +6,8 @@
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "scene/LibraryPath.h"
+#include "scene/Scene3D.h"
+#include "scene/SceneObjects.h"
 #include "scene/SceneServices.h"
 
 #include <algorithm>
@@ -48,6 +50,12 @@ VtCGlidePanelAbstractNavigatorObject::VtCGlidePanelAbstractNavigatorObject(
       document(&owningDocument)
 {
     if (parentObject)
+        sceneObjects = parentObject->sceneObjects;
+    else if (VtCScene3D* scene = document->GetScene())
+        sceneObjects = &scene->GetObjects();
+    if (sceneObjects)
+        sceneObjects->Enter(*this);
+    if (parentObject)
     {
         parentObject->AddChild(*this);
         Release();
@@ -62,6 +70,11 @@ VtCGlidePanelAbstractNavigatorObject::~VtCGlidePanelAbstractNavigatorObject()
 
     while (!children.empty())
         RemoveChild(*children.back());
+
+    if (life)
+        life->object = nullptr;
+    if (indexed)
+        sceneObjects->Leave(*this);
 
     attributeSink.reset();
     if (attributeObject && !OutlivesItsBody(*attributeObject))
@@ -124,19 +137,104 @@ const VtCAttributeTable& VtCGlidePanelAbstractNavigatorObject::GetAttributeTable
     return table;
 }
 
+void VtCGlidePanelAbstractNavigatorObject::SetDisplayName(const std::wstring& name)
+{
+    if (name == displayName)
+        return;
+    const std::wstring former = std::exchange(displayName, name);
+    if (told)
+        sceneObjects->Tell([&](VtISceneListener& listener) { listener.ObjectRenamed(*this, former); });
+}
+
 void VtCGlidePanelAbstractNavigatorObject::AddChild(VtCGlidePanelAbstractNavigatorObject& child)
 {
+    if (child.parent == this || &child == this || IsBelow(child))
+        return;
     child.AddRef();
+    VtCGlidePanelAbstractNavigatorObject* former = child.parent;
+    const bool moves = former && child.told && IsInScene() && child.sceneObjects == sceneObjects;
+    if (moves)
+    {
+        former->Forget(child);
+        child.Release();
+    }
+    else if (former)
+        former->RemoveChild(child);
+
     child.parent = this;
     children.push_back(&child);
+    if (moves)
+    {
+        child.ParentChanged();
+        child.SetModified();
+        sceneObjects->Tell([&](VtISceneListener& listener) { listener.ObjectMoved(child, *former); });
+    }
+    else if (child.complete)
+    {
+        // A new object enters when it is complete; this one comes back.
+        child.ParentChanged();
+        child.sceneObjects = sceneObjects;
+        child.EnterScene();
+    }
 }
 
 void VtCGlidePanelAbstractNavigatorObject::RemoveChild(VtCGlidePanelAbstractNavigatorObject& child)
 {
     if (child.parent != this)
         return;
+    child.LeaveScene();
     Forget(child);
     child.Release();
+}
+
+void VtCGlidePanelAbstractNavigatorObject::EnterScene()
+{
+    complete = true;
+    if (told || !sceneObjects || !parent || !parent->IsInScene())
+        return;
+    if (!indexed)
+        sceneObjects->Enter(*this);
+    told = true;
+    sceneObjects->Tell([this](VtISceneListener& listener) { listener.ObjectAdded(*this); });
+    for (std::size_t i = 0; i < children.size(); ++i)
+        if (children[i]->complete)
+        {
+            children[i]->sceneObjects = sceneObjects;
+            children[i]->EnterScene();
+        }
+}
+
+void VtCGlidePanelAbstractNavigatorObject::LeaveScene()
+{
+    for (std::size_t i = children.size(); i-- > 0;)
+        if (i < children.size()) // a listener may have removed others
+            children[i]->LeaveScene();
+    if (indexed)
+        sceneObjects->Leave(*this);
+    if (told)
+    {
+        told = false;
+        sceneObjects->Tell([this](VtISceneListener& listener) { listener.ObjectRemoved(*this); });
+    }
+    if (life)
+        life->object = nullptr;
+    life.reset();
+    sceneObjects = nullptr;
+}
+
+bool VtCGlidePanelAbstractNavigatorObject::IsBelow(const VtCGlidePanelAbstractNavigatorObject& other) const
+{
+    const VtCGlidePanelAbstractNavigatorObject* above = parent;
+    while (above && above != &other)
+        above = above->parent;
+    return above != nullptr;
+}
+
+const std::shared_ptr<VtTObjectLife>& VtCGlidePanelAbstractNavigatorObject::GetLife()
+{
+    if (!life)
+        life = std::make_shared<VtTObjectLife>(VtTObjectLife{this});
+    return life;
 }
 
 void VtCGlidePanelAbstractNavigatorObject::DetachFromParent()
@@ -172,6 +270,11 @@ VtCGlidePanelAbstractNavigatorObject* VtCGlidePanelAbstractNavigatorObject::Find
 
 VtCGlidePanelAbstractNavigatorObject* VtCGlidePanelAbstractNavigatorObject::FindById(std::wstring_view id) const
 {
+    return indexed ? sceneObjects->FindBelow(*this, id) : SearchById(id);
+}
+
+VtCGlidePanelAbstractNavigatorObject* VtCGlidePanelAbstractNavigatorObject::SearchById(std::wstring_view id) const
+{
     return FindDescendant(*this, [&](const Object& object) { return base::EqualsNoCase(object.internalId, id); });
 }
 
@@ -180,8 +283,15 @@ void VtCGlidePanelAbstractNavigatorObject::RebindAttributes(const std::wstring& 
     VtISceneObjectStore& store = GetServices().store;
     // Looked up first: `newId` may be the present id.
     const osg::ref_ptr<VtISceneObject> taken = store.GetObject(newId);
-    RemoveAttributeObject();
+    // One that stands there already keeps its place among the records.
+    if (!taken || taken != attributeObject || !base::EqualsNoCase(newId, internalId))
+        RemoveAttributeObject();
+    const bool found = indexed;
+    if (found)
+        sceneObjects->Leave(*this);
     internalId = newId;
+    if (found)
+        sceneObjects->Enter(*this);
     attributeObject = taken;
     if (!attributeObject)
         return;

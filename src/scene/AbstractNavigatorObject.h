@@ -12,8 +12,24 @@
 #include "records/SceneObject.h"
 #include "scene/AbstractObject.h"
 
+class VtCGlidePanelAbstractNavigatorObject;
+class VtCSceneObjects;
 class VtISceneDocument;
 struct VtTSceneServices;
+
+/// How far a constructor brings an object: `ObjectAdded` is told of a complete one only.
+enum class VtEBirth
+{
+    complete,      ///< told at the end of the constructor
+    recordFollows, ///< a stored record is applied next; told by `FinishLoad`
+    stepsFollow,   ///< told by the `EnterScene` of who makes it
+};
+
+/// What handles of an object share with it.
+struct VtTObjectLife
+{
+    VtCGlidePanelAbstractNavigatorObject* object; ///< null once it has gone
+};
 
 /// An object with an identity, a place in the object tree and a record in the attribute store.
 ///
@@ -62,16 +78,33 @@ public:
 
     const Objects& GetChildren() const { return children; }
 
+    /// Takes a reference. A child of somebody else moves here; an object doesn't move below itself.
     void AddChild(VtCGlidePanelAbstractNavigatorObject& child);
 
     /// Gives back the reference to `child`, which usually is its end. A stranger is ignored.
     void RemoveChild(VtCGlidePanelAbstractNavigatorObject& child);
     void DetachFromParent();
 
+    /// The object is complete: from now on listeners of its scene hear of it. Told once its parent has been told.
+    void EnterScene();
+
+    /// Tells that this and all below it leave the scene, while they are whole; nothing when that has been told.
+    /// `RemoveChild` and `Destroy` do so; who ends a whole tree in another way calls it first.
+    void LeaveScene();
+
+    /// Complete and in the tree of a scene. The collections at the top are.
+    bool IsInScene() const { return parent ? told : indexed; }
+
+    bool IsBelow(const VtCGlidePanelAbstractNavigatorObject& other) const;
+
+    /// For handles (scene/ObjectHandle.h).
+    const std::shared_ptr<VtTObjectLife>& GetLife();
+
     /// All objects below this one, each followed by its own descendants.
     void CollectDescendants(Objects& descendants) const;
 
-    /// The first descendant of that name or id, depth first, without regard to case; null when there is none.
+    /// The first descendant of that name or id, depth first, without regard to case; null when there is none. An id
+    /// is looked up in the index of the scene.
     VtCGlidePanelAbstractNavigatorObject* FindByName(std::wstring_view name) const;
     VtCGlidePanelAbstractNavigatorObject* FindById(std::wstring_view id) const;
     bool IsNameFree(std::wstring_view name) const { return !FindByName(name); }
@@ -113,18 +146,33 @@ protected:
     /// Called when a child has left the list; its derived parts may be gone.
     virtual void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child);
 
-    void SetDisplayName(const std::wstring& name) { displayName = name; }
+    /// Called when a complete object has got another parent, or one again.
+    virtual void ParentChanged() {}
+
+    /// The one place where a name changes.
+    void SetDisplayName(const std::wstring& name);
+
+    /// Of the scene that the object belongs to; null without one.
+    VtCSceneObjects* GetSceneObjects() const { return sceneObjects; }
 
     std::wstring internalId;
     std::unique_ptr<VTIPGEventSink> attributeSink; ///< null only at the very end
     osg::ref_ptr<VtISceneObject> attributeObject;  ///< null: writes to it are skipped
 
 private:
+    friend class VtCSceneObjects;
+
+    VtCGlidePanelAbstractNavigatorObject* SearchById(std::wstring_view id) const;
     void Forget(VtCGlidePanelAbstractNavigatorObject& child);
 
     std::wstring displayName;
     bool loading = false;
+    bool indexed = false;  ///< in the index of the scene
+    bool complete = false; ///< `EnterScene` was called
+    bool told = false;     ///< `ObjectAdded` was told, `ObjectRemoved` not yet
     VtISceneDocument* document;
+    VtCSceneObjects* sceneObjects = nullptr;
+    std::shared_ptr<VtTObjectLife> life; ///< made for the first handle
     VtCGlidePanelAbstractNavigatorObject* parent = nullptr;
     Objects children;
 };

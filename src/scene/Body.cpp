@@ -171,8 +171,19 @@ VtTAttributeRows VtC3DBody::GroupRows()
     };
 }
 
+void VtC3DBody::ParentChanged()
+{
+    const osg::ref_ptr<osg::Group> above = NodeOf(GetParent());
+    if (transformNode && parentNode)
+        parentNode->removeChild(transformNode);
+    if (transformNode && above)
+        above->addChild(transformNode);
+    parentNode = above;
+}
+
 void VtC3DBody::Destroy()
 {
+    LeaveScene();
     if (osg::Group* above = NodeOf(GetParent()); above && transformNode)
         above->removeChild(transformNode);
     DetachFromParent();

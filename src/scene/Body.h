@@ -151,6 +151,9 @@ protected:
     /// The node that bodies below `object` hang from; null when it isn't a body.
     static osg::Group* NodeOf(VtCGlidePanelAbstractNavigatorObject* object);
 
+    /// The node goes along.
+    void ParentChanged() override;
+
     /// Makes `node` the body's node, with user data that leads back to the body.
     virtual void SetTransformNode(osg::Group* node);
 

@@ -45,10 +45,6 @@ void VtCMovableBodies::RemoveBody(const std::wstring& id)
         return;
 
     const VtCScene3D* scene = GetDocument().GetScene();
-    auto* movable = dynamic_cast<VtC3DMovableBody*>(body);
-    if (scene && scene->GetSceneObservers() && movable)
-        scene->GetSceneObservers()->ReleaseBody(*movable);
-
     // A clone can't outlive what it replays.
     for (std::int32_t i = 1; scene && i < scene->GetMovableBodiesCount(); ++i)
     {

@@ -8,6 +8,7 @@
 #include "records/SceneObjectStore.h"
 #include "scene/LibraryPath.h"
 #include "scene/MovableBodies.h"
+#include "scene/SceneObjects.h"
 #include "scene/SceneServices.h"
 
 #include <algorithm>
@@ -162,10 +163,12 @@ std::wstring_view VtC3DMovableBody::AttributeOf(osg::Vec3f VtC3DBody::*field) co
 VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                                    const std::wstring& name, const std::wstring& path,
                                    const osg::Matrixd& insertTransform, bool inTree, osg::Node* model,
-                                   const std::wstring& id, bool recordFollows)
+                                   const std::wstring& id, VtEBirth birth)
     : VtC3DBody(owningDocument, &parentObject, name, path, inTree, id)
 {
-    JoinParent();
+    const VtCMovableBodies* collection = JoinParent();
+    pool = collection ? collection->pool : std::make_shared<VtCMotionPool>();
+    motion = &pool->Take();
 
     VtTSceneServices& services = GetServices();
     modelNode = model ? model : services.models.loadModel(path, true);
@@ -183,12 +186,14 @@ VtC3DMovableBody::VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePan
     if (dynamic_cast<VtC3DMovableBody*>(&parentObject))
         attributeObject = services.store.GetObject(internalId);
     if (!attributeObject)
-        MakeAttributeObject(description, objectTypeMovableBody, recordFollows);
+        MakeAttributeObject(description, objectTypeMovableBody, birth == VtEBirth::recordFollows);
     if (attributeObject)
         FillAttributes(insertTransform);
     PublishAttributes();
     if (!isGrouped)
         UpdateBaseTransform();
+    if (birth == VtEBirth::complete)
+        EnterScene();
 }
 
 VtC3DMovableBody::~VtC3DMovableBody()
@@ -204,18 +209,23 @@ VtC3DMovableBody::~VtC3DMovableBody()
     pool->GiveBack(*motion);
 }
 
-void VtC3DMovableBody::JoinParent()
+VtCMovableBodies* VtC3DMovableBody::JoinParent()
 {
     auto* group = dynamic_cast<VtC3DMovableBody*>(GetParent());
     auto* collection = dynamic_cast<VtCMovableBodies*>(group ? group->GetParent() : GetParent());
-    pool = collection ? collection->pool : std::make_shared<VtCMotionPool>();
-    motion = &pool->Take();
     if (group)
         group->parts.push_back(this);
     else if (collection)
         collection->bodies.push_back(this);
     if (collection)
         collection->motionsStale = true;
+    return collection;
+}
+
+void VtC3DMovableBody::ParentChanged()
+{
+    VtC3DBody::ParentChanged();
+    JoinParent();
 }
 
 void VtC3DMovableBody::SetTransformNode(osg::Group* node)
@@ -334,7 +344,7 @@ VtC3DMovableBody* VtC3DMovableBody::CloneIntoTrack(VtCMovableBodies& target, VtC
 
     const osg::ref_ptr<osg::Node> copy = GetServices().models.clone(modelNode);
     auto* clone = new VtC3DMovableBody(GetDocument(), target, GetName(), GetFilePath(), osg::Matrixd(),
-                                       HasNavigatorItem(), copy, {});
+                                       HasNavigatorItem(), copy, {}, VtEBirth::stepsFollow);
     clone->cloneSource = this;
     clone->track = clonesTrack;
     clone->SetScaleX(scale.x());
@@ -358,6 +368,7 @@ VtC3DMovableBody* VtC3DMovableBody::CloneIntoTrack(VtCMovableBodies& target, VtC
         clone->WriteAttribute(attribute::clonedFrom, internalId);
         clone->WriteAttribute(attribute::trackId, trackNumber);
     }
+    clone->EnterScene();
     return clone;
 }
 
@@ -391,7 +402,10 @@ void VtC3DMovableBody::UpdateConnectionState()
     const std::vector<std::wstring>* channels = CurrentChannels(GetServices());
     const std::int32_t index = motion->simulationDataIndex;
     const bool offered = channels && index >= 0 && static_cast<std::size_t>(index) < channels->size();
+    const std::int32_t former = connectionState;
     connectionState = index == -1 ? notConnected : offered ? connected : channelMissing;
+    if (connectionState != former && IsInScene())
+        GetSceneObjects()->Tell([this](VtISceneListener& listener) { listener.ConnectionStateChanged(*this); });
     for (VtC3DMovableBody* part : parts)
         part->UpdateConnectionState();
 }
@@ -422,6 +436,7 @@ void VtC3DMovableBody::FinishLoad(const std::wstring& id)
     for (const std::wstring_view channel : {attribute::channelIndex, attribute::channelName})
         if (attributeObject && attributeObject->GetAttribute(channel))
             WriteBack(channel);
+    EnterScene();
 }
 
 void MoveByColumnsPortable(VtTBodyMotion& motion, const float* values)

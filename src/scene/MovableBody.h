@@ -11,6 +11,7 @@
 #include <osg/MatrixTransform>
 
 #include "scene/Body.h"
+#include "scene/ObjectHandle.h"
 
 class VtCMovableBodies;
 class VtCTrack;
@@ -68,11 +69,11 @@ public:
 
     /// Belongs to `parent` (a collection, or the group that it becomes a part of). `path` is a complete path;
     /// `insertTransform` places a grouped body as a whole; `model` is used in place of the file if it isn't null. An
-    /// empty `id` gives a fresh one. With `recordFollows` no default record is made, for a stored one is applied and
-    /// taken over next. A file that can't be read leaves the body without geometry.
+    /// empty `id` gives a fresh one. When a record follows, no default one is made. A file that can't be read leaves
+    /// the body without geometry.
     VtC3DMovableBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                      const std::wstring& name, const std::wstring& path, const osg::Matrixd& insertTransform,
-                     bool inTree, osg::Node* model, const std::wstring& id, bool recordFollows = false);
+                     bool inTree, osg::Node* model, const std::wstring& id, VtEBirth birth = VtEBirth::complete);
 
     /// Binds the body to the channel `index`, -1 for none. An empty `stream` is named by the data point, or by the
     /// index. A group ignores it: its parts have channels of their own.
@@ -115,11 +116,11 @@ public:
     /// A body that replays this one in `clonesTrack` (not owned), member of `target`; null without a model to copy.
     VtC3DMovableBody* CloneIntoTrack(VtCMovableBodies& target, VtCTrack* clonesTrack, std::int32_t trackNumber);
 
-    VtC3DMovableBody* GetCloneSource() const { return cloneSource; }
+    VtC3DMovableBody* GetCloneSource() const { return cloneSource.Get(); }
     VtCTrack* GetTrack() const { return track; }
     bool IsClone() const { return track != nullptr; }
 
-    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
+    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`. The body is complete then.
     void FinishLoad(const std::wstring& id);
 
     /// What its record holds. `position` is the field `center`: the stored place is that of the model in the body.
@@ -129,11 +130,12 @@ public:
 protected:
     ~VtC3DMovableBody() override;
     void ChildRemoved(VtCGlidePanelAbstractNavigatorObject& child) override;
+    void ParentChanged() override;
     void SetTransformNode(osg::Group* node) override;
     std::wstring_view AttributeOf(osg::Vec3f VtC3DBody::*field) const override;
 
 private:
-    void JoinParent();
+    VtCMovableBodies* JoinParent();
     void FillAttributes(const osg::Matrixd& insertTransform);
     void ExpandGroup();
     void AddPart(const std::wstring& oldId, const std::wstring& newId, const std::wstring& path);
@@ -147,6 +149,6 @@ private:
     osg::Matrixd groupChildMatrix; ///< of a part: its place inside the group
     osg::Matrixd insertMatrix;     ///< of a group: the place of the whole
     std::vector<VtC3DMovableBody*> parts;
-    VtC3DMovableBody* cloneSource = nullptr; ///< not owned
-    VtCTrack* track = nullptr;               ///< not owned
+    VtCObjectHandle<VtC3DMovableBody> cloneSource;
+    VtCTrack* track = nullptr; ///< not owned
 };

@@ -8,7 +8,6 @@
 #include "records/SceneObjectStore.h"
 #include "scene/Collectors.h"
 #include "scene/MovableBody.h"
-#include "scene/SceneLoader.h"
 #include "scene/SceneServices.h"
 #include "scene/StaticBody.h"
 
@@ -81,6 +80,9 @@ VtCScene3D::VtCScene3D(VtISceneDocument& owningDocument) : document(owningDocume
 
 VtCScene3D::~VtCScene3D()
 {
+    for (VtCMovableBodies* collection : movableBodies)
+        collection->LeaveScene();
+    staticBodies->LeaveScene();
     for (VtCMovableBodies* collection : movableBodies)
         collection->Release();
     movableBodies.clear();
@@ -223,11 +225,6 @@ void VtCScene3D::ChangeGlobalRenderMode(VtERenderMode mode, bool useOwnModes)
         SetGlobalRenderMode(mode, useOwnModes);
 }
 
-bool VtCScene3D::LoadSceneFile(const std::wstring& path, bool skip)
-{
-    return !skip && VtCSceneLoader(*this).Load(path);
-}
-
 bool VtCScene3D::SaveSceneFile(const std::wstring& path)
 {
     return document.GetServices().store.SaveFile(path);
@@ -246,24 +243,18 @@ bool VtCScene3D::SaveScene(const std::wstring& path)
     return true;
 }
 
-void VtCScene3D::LoadBodiesFromFile(const std::wstring& path)
-{
-    VtCSceneLoader(*this).LoadBodies(path);
-}
-
-void VtCScene3D::LoadObjectsFromFile(const std::wstring& path)
-{
-    VtCSceneLoader(*this).LoadObjects(path);
-}
-
-void VtCScene3D::ResolveObserverTargets()
-{
-    VtCSceneLoader::ResolveObserverTargets(*this);
-}
-
 const std::wstring& VtCScene3D::GetFileError() const
 {
     return document.GetServices().store.GetFileError();
+}
+
+void VtCScene3D::SetActiveView(VtCBase3DView* view, VtCGlidePanelAbstractNavigatorObject* observer)
+{
+    if (view == activeView && observer == activeObserver.Get())
+        return;
+    activeView = view;
+    activeObserver = observer;
+    objects.Tell([&](VtISceneListener& listener) { listener.ActiveViewChanged(view, observer); });
 }
 
 void VtCScene3D::UpdateFrame()

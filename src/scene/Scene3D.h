@@ -15,14 +15,15 @@
 #include "records/PGEventSink.h"
 #include "records/SceneObject.h"
 #include "scene/MovableBodies.h"
+#include "scene/ObjectHandle.h"
 #include "scene/RenderMode.h"
+#include "scene/SceneObjects.h"
 #include "scene/StaticBodies.h"
 
 class VtC3DMovableBody;
 class VtCTrack;
 class VtISceneDocument;
 class VtISceneObservers;
-class VtISceneViews;
 
 /// One scene: the top of the scene graph, the collections of bodies, and the render mode of all of them.
 ///
@@ -37,6 +38,10 @@ public:
     VtCScene3D& operator=(const VtCScene3D&) = delete;
 
     VtISceneDocument& GetDocument() const { return document; }
+
+    /// All objects of the scene by their ids, and the list of those who hear of them.
+    VtCSceneObjects& GetObjects() { return objects; }
+    const VtCSceneObjects& GetObjects() const { return objects; }
 
     // The graph: the root, with the environment and the content; the content holds the overlay projection, the static
     // bodies, the movable bodies and those of each track, in this order.
@@ -100,12 +105,7 @@ public:
                             const VtTAttributeValue& value) override;
     void OnRecordChanged() override;
 
-    // The scene file. Paths in the inner form. A record of a body without its name, file or id throws
-    // `VtCAttributeError`, which ends the load; what was built until then stays.
-
-    /// Builds everything that the file holds. False when it can't be read, the scene then being as it was, and with
-    /// `skip`, which does nothing.
-    bool LoadSceneFile(const std::wstring& path, bool skip);
+    // The scene file. Paths in the inner form. It is read by the loader of the application (app/SceneLoader.h).
 
     /// Writes the records as they are. The file changes whole or not at all.
     bool SaveSceneFile(const std::wstring& path);
@@ -114,23 +114,21 @@ public:
     /// unmodified only when that succeeds.
     bool SaveScene(const std::wstring& path);
 
-    /// Builds the bodies alone, or everything but the bodies, for a scene that is loaded anew from two files.
-    void LoadBodiesFromFile(const std::wstring& path);
-    void LoadObjectsFromFile(const std::wstring& path);
-
-    /// Has the user choose bodies for the observers whose body is missing. Nothing without a user.
-    void ResolveObserverTargets();
-
-    /// Why the last of these failed: "scene.xml, line 3: ..."; empty when it didn't.
+    /// Why the last read or write failed: "scene.xml, line 3: ..."; empty when it didn't.
     const std::wstring& GetFileError() const;
 
     /// All image files of the scene's textures, as of the end of the last load.
     const std::vector<std::wstring>& GetTextureFiles() const { return textureFiles; }
     void SetTextureFiles(std::vector<std::wstring> files) { textureFiles = std::move(files); }
 
-    /// Not owned, may be null.
-    void SetViews(VtISceneViews* sceneViews) { views = sceneViews; }
-    VtISceneViews* GetViews() const { return views; }
+    // The view that has the focus.
+
+    /// `observer` is the one that `view` looks through. Null when there is no view any more.
+    void SetActiveView(VtCBase3DView* view, VtCGlidePanelAbstractNavigatorObject* observer);
+    VtCBase3DView* GetActiveView() const { return activeView; }
+
+    /// Null when the active view has none, and when it has left the scene.
+    VtCGlidePanelAbstractNavigatorObject* GetActiveObserver() const { return activeObserver.Get(); }
 
     // The frame.
 
@@ -148,6 +146,7 @@ private:
     void ApplyGlobalRenderMode(VtERenderMode mode, bool useOwnModes);
 
     VtISceneDocument& document;
+    VtCSceneObjects objects;
     std::int32_t maxTracks = 0;
     VtERenderMode globalRenderMode = VtERenderMode::Mixed;
     osg::ref_ptr<VtISceneObject> renderSettings;
@@ -162,7 +161,8 @@ private:
     VtCStaticBodies* staticBodies = nullptr;      ///< one reference
     std::vector<VtCMovableBodies*> movableBodies; ///< one reference each
     VtISceneObservers* observers = nullptr;
-    VtISceneViews* views = nullptr;
+    VtCBase3DView* activeView = nullptr; ///< not owned; its frame takes it back
+    VtCObjectHandle<> activeObserver;
     std::vector<std::wstring> textureFiles;
 };
 

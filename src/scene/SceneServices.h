@@ -25,7 +25,6 @@ class Node;
 
 class VtC3DMovableBody;
 class VtCScene3D;
-class VtIObserverRecords;
 class VtISceneObjectStore;
 
 /// Where bodies get their models and shaders from. The asset manager of the renderer implements it.
@@ -92,12 +91,6 @@ public:
 
     /// A live run begins: what was remembered of an earlier one is forgotten.
     virtual void ClearFollowers() {}
-
-    /// `body` is about to go: observers that ride on it stay where they are, not connected.
-    virtual void ReleaseBody(VtC3DMovableBody& body) = 0;
-
-    /// Where stored observers go; null where none are taken.
-    virtual VtIObserverRecords* GetRecords() { return nullptr; }
 };
 
 /// What objects of a scene need from outside; made once by the application object.

@@ -75,7 +75,7 @@ void VtC3DStaticBody::OnAttributeChanged(const std::wstring& objectId, const std
 VtC3DStaticBody::VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                                  const std::wstring& name, const std::wstring& path,
                                  const osg::Matrixd& insertTransform, bool inTree, const std::wstring& id,
-                                 bool recordFollows)
+                                 VtEBirth birth)
     : VtC3DBody(owningDocument, &parentObject, name, path, inTree, id)
 {
     VtIModelLibrary& models = GetServices().models;
@@ -89,10 +89,20 @@ VtC3DStaticBody::VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanel
     if (parentNode)
         parentNode->addChild(transform);
 
-    MakeAttributeObject(models.getXmlAttributes(path), objectTypeStaticBody, recordFollows);
+    MakeAttributeObject(models.getXmlAttributes(path), objectTypeStaticBody, birth == VtEBirth::recordFollows);
     if (attributeObject)
         FillAttributes(insertTransform);
     PublishAttributes();
+    if (birth == VtEBirth::complete)
+        EnterScene();
+}
+
+void VtC3DStaticBody::ParentChanged()
+{
+    VtC3DBody::ParentChanged();
+    const auto* above = dynamic_cast<VtC3DStaticBody*>(GetParent());
+    if (above || (attributeObject && attributeObject->GetAttribute(attribute::parentObjectId)))
+        WriteAttribute(attribute::parentObjectId, above ? above->GetInternalId() : std::wstring());
 }
 
 void VtC3DStaticBody::FillAttributes(const osg::Matrixd& insertTransform)
@@ -166,4 +176,6 @@ void VtC3DStaticBody::FinishLoad(const std::wstring& id)
 {
     RebindAttributes(id);
     AddMissingDyeAttributes();
+    UpdateBaseTransform();
+    EnterScene();
 }

@@ -13,11 +13,11 @@ class VtC3DStaticBody final : public VtC3DBody
 public:
     /// Belongs to `parentObject` (the collection, or a static body). `path` is a complete path; an empty `id` gives a
     /// fresh one. The node has the matrix `insertTransform` until a placement value changes or `UpdateBaseTransform`
-    /// is called. With `recordFollows` no default record is made, for a stored one is applied and taken over next.
+    /// is called. When a record follows, no default one is made.
     /// Throws `VtCAttributeError` when `insertTransform` holds no finite numbers.
     VtC3DStaticBody(VtISceneDocument& owningDocument, VtCGlidePanelAbstractNavigatorObject& parentObject,
                     const std::wstring& name, const std::wstring& path, const osg::Matrixd& insertTransform,
-                    bool inTree, const std::wstring& id, bool recordFollows = false);
+                    bool inTree, const std::wstring& id, VtEBirth birth = VtEBirth::complete);
 
     void UpdateBaseTransform() override;
 
@@ -33,7 +33,7 @@ public:
     /// The body's own transform: the same node as `GetTransformNode`.
     osg::MatrixTransform* GetPlacementNode() const { return matrixNode; }
 
-    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`.
+    /// After `ApplyAttributes` of a loaded record: takes over the record stored under `id`. The body is complete then.
     virtual void FinishLoad(const std::wstring& id);
 
     /// What the table knows, and of a group the values of its parts.
@@ -47,6 +47,9 @@ public:
 protected:
     ~VtC3DStaticBody() override = default;
     std::wstring_view AttributeOf(osg::Vec3f VtC3DBody::*field) const override;
+
+    /// The record says who the parent is.
+    void ParentChanged() override;
 
 private:
     void FillAttributes(const osg::Matrixd& insertTransform);

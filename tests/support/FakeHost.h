@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <map>
 #include <string>
 #include <utility>
@@ -16,6 +17,7 @@
 #include "host/Messages.h"
 #include "host/Progress.h"
 #include "host/Questions.h"
+#include "host/Selection.h"
 #include "host/Storage.h"
 
 /// A host for tests: it answers and remembers, and expects nothing by itself.
@@ -278,6 +280,25 @@ public:
     std::wstring module = L"\\app\\bin\\";
 };
 
+/// Ids as they are given; nobody is told.
+class Selection : public host::Selection
+{
+public:
+    void ClearSelection() override { selected.clear(); }
+    void AddToSelection(const std::wstring& id) override { selected.push_back(id); }
+    void RemoveFromSelection(const std::wstring& id) override { std::erase(selected, id); }
+    void SelectOnly(const std::wstring& id) override { selected = {id}; }
+    bool IsSelected(const std::wstring& id) const override
+    {
+        return std::find(selected.begin(), selected.end(), id) != selected.end();
+    }
+    const std::vector<std::wstring>& GetSelection() const override { return selected; }
+    void AddListener(host::SelectionListener&) override {}
+    void RemoveListener(host::SelectionListener&) override {}
+
+    std::vector<std::wstring> selected;
+};
+
 class DocumentManager : public host::DocumentManager
 {
 public:
@@ -308,6 +329,7 @@ public:
     host::Clock& GetClock() override { return clock; }
     host::Texts& GetTexts() override { return texts; }
     host::LibraryPaths& GetLibraryPaths() override { return paths; }
+    host::Selection& GetSelection() override { return selection; }
     host::MainWindow* GetMainWindow() override { return mainWindowService; }
     host::Variables* GetVariables() override { return variablesService; }
     host::UserInterface* GetUserInterface() override { return &userInterface; }
@@ -326,6 +348,7 @@ public:
     MainWindow mainWindow;
     Variables variables;
     UserInterface userInterface;
+    Selection selection;
     DocumentManager documentManager;
     MessageService messages;
     Progress progress;

@@ -74,7 +74,6 @@ public:
         return std::make_unique<ChildFrameWindow>(splitter, periods, ticks);
     }
     host::OpenedWindow OpenWindow(const host::WindowRequest&) override { return {nullptr, L"only a frame"}; }
-    void SelectObject(const std::wstring& internalId) override { selected.push_back(internalId); }
 
     /// Lets every timer fire once; a tick may end its own timer.
     void Fire()
@@ -87,7 +86,6 @@ public:
     SplitterWindow splitter;
     std::map<std::uint32_t, std::uint32_t> periods;
     std::map<std::uint32_t, std::function<void()>> ticks;
-    std::vector<std::wstring> selected;
 };
 
 } // namespace fake

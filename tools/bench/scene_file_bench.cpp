@@ -9,6 +9,7 @@
 
 #include <benchmark/benchmark.h>
 
+#include "app/SceneLoader.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "records/AttributeNames.h"
@@ -80,8 +81,10 @@ void TimeLoad(benchmark::State& state, Document& document, const std::wstring& f
 {
     document.store.Clear();
     auto scene = std::make_unique<VtCScene3D>(document);
+    VtCRecordBuilders builders;
+    RegisterSceneRecords(builders);
     state.ResumeTiming();
-    const bool loaded = scene->LoadSceneFile(file, false);
+    const bool loaded = VtCSceneLoader(*scene, builders).Load(file);
     state.PauseTiming();
     if (!loaded)
         throw std::runtime_error(base::Utf8(scene->GetFileError()));

@@ -105,6 +105,31 @@ TEST_F(Document, TheUserChoosesForObserversWhoseBodyIsMissing)
     EXPECT_EQ(document->GetObservers().FindObserverByName(L"Lost")->GetConnectedBodyName(), L"Car");
 }
 
+TEST_F(Document, WhatHasGoneIsNotSelectedAnyMore)
+{
+    VtCPanoramicDocument* document = Open(RichScene());
+    ASSERT_NE(document, nullptr);
+    host.selection.selected = {L"ride", L"car", L"lost"};
+    document->GetObservers().RemoveObserver(L"Ride");
+    document->GetScene()->GetMovableBodies(0)->RemoveBody(L"CAR");
+    EXPECT_EQ(host.selection.selected, std::vector<std::wstring>{L"lost"});
+    CloseDocuments();
+    EXPECT_TRUE(host.selection.selected.empty());
+}
+
+TEST_F(Document, TheSceneKnowsItsActiveViewAndItsObserver)
+{
+    VtCPanoramicDocument* document = Open(RichScene());
+    ASSERT_NE(document, nullptr);
+    const VtCScene3D& scene = *document->GetScene();
+    VtCPanoramicView& second = *document->GetChildFrame()->getSplitter().getView(2);
+    document->GetChildFrame()->activateView(second);
+    EXPECT_EQ(scene.GetActiveView(), &second);
+    EXPECT_EQ(scene.GetActiveObserver()->GetName(), L"Ride");
+    second.assignObserverByName(L"Free2");
+    EXPECT_EQ(scene.GetActiveObserver(), document->GetObservers().GetFree2());
+}
+
 TEST_F(Document, ASceneThatEndsInTheMiddleOfItsLoadIsNotOpened)
 {
     EXPECT_EQ(Open(Scene(Record(7, "car", "Car", ""))), nullptr) << "a body without its file";

@@ -20,7 +20,6 @@ struct Witness : VtISceneObservers, osg::Camera::DrawCallback
     explicit Witness(const VtC3DMovableBody& watched) : body(watched) {}
 
     void UpdateObservers() override { Note("observers"); }
-    void ReleaseBody(VtC3DMovableBody&) override {}
     void operator()(osg::RenderInfo&) const override { Note("picture"); }
     void Note(const char* who) const { log.push_back(std::string(who) + " " + Place()); }
     std::string Place() const { return std::to_string(std::lround(body.GetTransform().getTrans().x())); }

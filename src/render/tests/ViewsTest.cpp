@@ -55,7 +55,7 @@ protected:
     void Open()
     {
         frame = std::make_unique<VtCChildFrame>(
-            VtTChildFrameServices{document, *observers, *this, mouse, windows, clock, nullptr, nullptr});
+            VtTChildFrameServices{document, *observers, *this, mouse, windows, selection, clock, nullptr, nullptr});
     }
 
     void CreateViews()
@@ -93,6 +93,7 @@ protected:
     fake::SceneDocument document;
     fake::Clock clock;
     fake::ViewWindows windows;
+    fake::Selection selection;
     hosts::EglGraphics graphics;
     VtCMouseInputManager mouse;
     std::unique_ptr<VtCScene3D> scene;
@@ -313,7 +314,7 @@ TEST_F(Views, ADoubleClickSelectsWhatIsSeen)
 
     const host::Rectangle size = pane.getWindow().GetClientRectangle();
     pane.getWindow().GetEvents()->OnLeftDoubleClick(size.width / 2, size.height / 2);
-    EXPECT_EQ(windows.selected, (std::vector<std::wstring>{body.GetInternalId()}));
+    EXPECT_EQ(selection.selected, (std::vector<std::wstring>{body.GetInternalId()}));
     EXPECT_EQ(PanesInViewer().size(), 4u);
     pane.getWindow().GetEvents()->OnLeftDoubleClick(5, 5);
     EXPECT_EQ(PanesInViewer(), (std::vector<int>{1})) << "a click on nothing enlarges the pane";

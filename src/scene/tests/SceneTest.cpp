@@ -171,10 +171,8 @@ class Observers : public VtISceneObservers
 {
 public:
     void UpdateObservers() override { ++updates; }
-    void ReleaseBody(VtC3DMovableBody& body) override { released.push_back(body.GetName()); }
 
     int updates = 0;
-    std::vector<std::wstring> released;
 };
 
 TEST_F(Scene, UpdatesItsObserversIfItHasAny)
