@@ -10,7 +10,6 @@
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "host/LibraryPaths.h"
-#include "hosts/common/MotionDataFile.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/Session.h"
 #include "records/AttributeNames.h"
@@ -141,27 +140,7 @@ void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneAr
 
 bool LoadData(Session& session, const std::filesystem::path& file)
 {
-    ConsoleHost& host = session.GetHost();
-    VtCSimulationDataRouter& router = session.GetController().GetRouter();
-    SimulationDataPoints::VtCSimulationDataPoint* point = router.FindPoint(hosts::filePoint);
-    if (!point)
-    {
-        host.ShowError(hosts::messageNoFilePoint);
-        return false;
-    }
-    const bool configured =
-        hosts::LoadMotionData(*point, base::InnerPath(Complete(file)), *host.GetProgress(), host.GetTexts());
-
-    if (configured)
-        session.GetController().ChoosePoint(hosts::filePoint);
-    if (SimulationDataPoints::VtCMessageStack* stack = point->GetMessageStack())
-    {
-        session.GetApp().GetMessageHandler().ReportStack(*stack);
-        point->ResetMessageStack();
-    }
-    if (!configured && session.GetExitStatus() == 0)
-        host.ShowError(hosts::messageDataUnusable, file.string());
-    return configured;
+    return session.GetController().LoadMotionData(base::InnerPath(Complete(file)));
 }
 
 bool BindChannels(Session& session, VtCPanoramicDocument& document, const std::vector<MovableArgument>& movables)

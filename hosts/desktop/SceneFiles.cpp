@@ -9,7 +9,6 @@
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/common/IniTexts.h"
-#include "hosts/common/MotionDataFile.h"
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/Wording.h"
@@ -171,34 +170,9 @@ void SceneFiles::CloseScene()
 bool SceneFiles::LoadData(const std::wstring& path)
 {
     VtCSimulationDataController* controller = app.GetController();
-    SimulationDataPoints::VtCSimulationDataPoint* point =
-        controller ? controller->GetRouter().FindPoint(hosts::filePoint) : nullptr;
-    if (!point)
-    {
-        app.GetMessageHandler().ShowError(hosts::messageNoFilePoint);
-        return false;
-    }
-    controller->StopPlay();
-    controller->Stop();
-
     const Pause pause(host.GetPump());
-    const bool configured = hosts::LoadMotionData(*point, path, *host.GetProgress(), host.GetTexts());
-
-    const bool explained = point->GetMessageStack() != nullptr;
-    if (explained)
-    {
-        app.GetMessageHandler().ReportStack(*point->GetMessageStack());
-        point->ResetMessageStack();
-    }
-    if (!configured)
-    {
-        if (!explained)
-            app.GetMessageHandler().ShowError(hosts::messageDataUnusable, FromQt(ShownPath(path)));
+    if (!controller || !controller->LoadMotionData(path))
         return false;
-    }
-    controller->ChoosePoint(hosts::filePoint);
-    controller->GetRouter().NotifyConfiguration(controller->GetRouter().GetConfigurationText(hosts::filePoint, 0));
-    controller->GotoFirst();
     dataPath = path;
     Remember(path);
     changed();

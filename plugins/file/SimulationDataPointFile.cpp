@@ -59,7 +59,7 @@ int VtCSimulationDataPointFile::Connect()
         return connected;
     }
     unsigned long count = 0;
-    connected = GetInitialStreamMode() == 0 ? LookAtFile() : GetBufferedFrames(count) || LoadFile();
+    connected = GetInitialStreamMode() == 0 ? LookAtFile(sourcePath) : GetBufferedFrames(count) || LoadFile(sourcePath);
     startOver = true;
     return connected;
 }
@@ -76,7 +76,6 @@ void VtCSimulationDataPointFile::GetSourcePath(std::wstring& path) const
 
 int VtCSimulationDataPointFile::Configure(const std::wstring& type, const std::wstring& path, int mode, int)
 {
-    Disconnect();
     const int direction = mode & 0xFFFF;
     if (!base::EqualsNoCase(type, sourceType) || path.empty() || (direction != modeRead && direction != modeWrite))
     {
@@ -84,38 +83,42 @@ int VtCSimulationDataPointFile::Configure(const std::wstring& type, const std::w
                        GetName() + L": this is no motion data file to read or write: \"" + path + L"\"");
         return 0;
     }
-    sourcePath = base::InnerPath(base::NativePath(path));
+    const std::wstring wanted = base::InnerPath(base::NativePath(path));
     if (direction == modeWrite)
     {
         // The buffer stays: a track stores the frames it got from this very point.
+        Disconnect();
         use = Use::writing;
         growing = (static_cast<unsigned>(mode) >> 16) == 0;
-        return 1;
     }
-    use = Use::reading;
-    DropBuffer();
-    SetDescription(nullptr);
-    const int usable = GetInitialStreamMode() == 0 ? LookAtFile() : LoadFile();
-    if (!usable)
+    else
     {
-        use = Use::none;
-        sourcePath.clear();
+        // Read first: a file that can't be used leaves what is there as it was.
+        const bool lookOnly = GetInitialStreamMode() == 0;
+        if (!(lookOnly ? LookAtFile(wanted) : LoadFile(wanted)))
+            return 0;
+        if (lookOnly)
+            DropBuffer();
+        Disconnect();
+        use = Use::reading;
     }
-    return usable;
+    sourcePath = wanted;
+    return 1;
 }
 
-int VtCSimulationDataPointFile::LookAtFile()
+// The channels alone.
+int VtCSimulationDataPointFile::LookAtFile(const std::wstring& path)
 {
-    VtCMotionDataReader reader(File());
+    VtCMotionDataReader reader(base::NativePath(path));
     if (!reader.Open())
         return FailReading(reader);
     SetDescription(reader.GetDescription());
     return 1;
 }
 
-int VtCSimulationDataPointFile::LoadFile()
+int VtCSimulationDataPointFile::LoadFile(const std::wstring& path)
 {
-    VtCMotionDataReader reader(File());
+    VtCMotionDataReader reader(base::NativePath(path));
     if (!reader.Open())
         return FailReading(reader);
     const long activity = GetProgressBarActivityID();
@@ -126,7 +129,7 @@ int VtCSimulationDataPointFile::LoadFile()
     SetDescription(reader.GetDescription());
     TakeBuffer(std::move(frames));
     for (const std::wstring& damage : reader.GetDamage().Texts())
-        Messages().Add(VtEMessageSeverity::warning, base::Wide(File().string()) + L": " + damage);
+        Messages().Add(VtEMessageSeverity::warning, base::Wide(base::NativePath(path).string()) + L": " + damage);
     return 1;
 }
 
@@ -143,7 +146,7 @@ std::filesystem::path VtCSimulationDataPointFile::File() const
 
 int VtCSimulationDataPointFile::FetchOnce()
 {
-    return use == Use::reading ? LoadFile() : 0;
+    return use == Use::reading ? LoadFile(sourcePath) : 0;
 }
 
 VtCSimulationDataFrame* VtCSimulationDataPointFile::GetCurrentFrame(unsigned long& frame)

@@ -17,9 +17,10 @@ class VtCMotionDataWriter;
 /// The point "File": replays a motion data file, or writes one.
 ///
 /// Reading: `Configure` opens the file, and with the initial stream mode 1 loads all its frames, so that they can be
-/// walked offline; `Connect` loads what isn't there yet, and with the mode 0 only looks at the header. `FetchOnce`
-/// reads the file again, with what has been added to it. Online a file with time stamps plays by the simulation time,
-/// held at its ends; one without gives its frames one after another, round and round.
+/// walked offline; a file that can't be used leaves the one before it in place. `Connect` loads what isn't there yet,
+/// and with the mode 0 only looks at the header. `FetchOnce` reads the file again, with what has been added to it.
+/// Online a file with time stamps plays by the simulation time, held at its ends; one without gives its frames one
+/// after another, round and round.
 ///
 /// Writing: `Configure` with a writing mode, `Connect`, `WriteFrames`, `Disconnect`. Channels come from the `Set...`
 /// operations; what these leave out (always the units) comes from the first frame. See `MotionDataWriteMode` for the
@@ -55,8 +56,8 @@ private:
         writing,
     };
 
-    int LookAtFile();
-    int LoadFile();
+    int LookAtFile(const std::wstring& path);
+    int LoadFile(const std::wstring& path);
     int FailReading(const VtCMotionDataReader& reader);
     VtTChannelDescription ChannelsToWrite(const VtTChannelDescription& ofFrame) const;
     bool BeginWriting(const VtCSimulationDataFrame& frame);

@@ -182,8 +182,7 @@ void VtCPanoramicApp::MakeControllerDialog()
         *controller, VtTCustomizeServices{.texts = host.GetTexts(),
                                           .messages = host.GetMessageService(),
                                           .sheets = host.GetPropertySheets(),
-                                          .questions = questions,
-                                          .progress = progress});
+                                          .questions = questions});
     controllerDialog =
         std::make_unique<VtCSimulationDataControllerDialog>(*controller, customizeSheet.get(), userInterface);
 }

@@ -9,7 +9,7 @@
 #include "app/FrameCycle.h"
 #include "app/PanoramicMessageHandler.h"
 #include "app/VisualizationPPGSettings.h"
-#include "simdata/ActiveScene.h"
+#include "simdata/SimulationServices.h"
 
 namespace host
 {

@@ -3,7 +3,6 @@
 
 #include "host/Messages.h"
 #include "host/Questions.h"
-#include "simdata/CustomizeSheet.h"
 #include "simdata/SimulationDataController.h"
 
 namespace
@@ -19,7 +18,7 @@ bool IsSelect(std::uint32_t command)
 
 } // namespace
 
-VtTCommandState VtCSimulationDataController::IsCommandEnabled(const std::wstring& name, std::uint32_t command)
+VtTCommandState VtCSimulationDataController::IsCommandEnabled(const std::wstring& name, std::uint32_t command) const
 {
     using namespace ControllerCommand;
     switch (command)
@@ -37,11 +36,8 @@ VtTCommandState VtCSimulationDataController::IsCommandEnabled(const std::wstring
         return {};
 
     VtTCommandState state = FrameCommandState(name, command);
-    if ((command == spoolBack || command == spoolForward) && state.checked && !state.enabled)
-    {
-        state.checked = false;
-        playState = VtEPlayState::PlayStopped;
-    }
+    if (command == spoolBack || command == spoolForward)
+        state.checked = state.checked && state.enabled;
     return state;
 }
 
@@ -59,7 +55,7 @@ VtTCommandState VtCSimulationDataController::FrameCommandState(const std::wstrin
         return {idle, false};
     case refreshData:
     {
-        const auto* point = name.empty() ? router.GetActivePoint(0) : router.FindPoint(name);
+        const auto* point = name.empty() ? router.GetActivePoint() : router.FindPoint(name);
         return {idle && point && point->CanRefresh(), false};
     }
     case store:
@@ -86,7 +82,7 @@ VtTCommandState VtCSimulationDataController::FrameCommandState(const std::wstrin
     }
 }
 
-std::optional<VtTMenuState> VtCSimulationDataController::GetMenuState(std::uint32_t command)
+std::optional<VtTMenuState> VtCSimulationDataController::GetMenuState(std::uint32_t command) const
 {
     using namespace ControllerCommand;
     if (command == refreshChannels)
@@ -96,7 +92,7 @@ std::optional<VtTMenuState> VtCSimulationDataController::GetMenuState(std::uint3
     if (command == customize)
     {
         const bool shown = customizeSheet && customizeSheet->CanCustomize();
-        return VtTMenuState{{shown && IsCommandEnabled(selectedPoint, command).enabled, false}, {}};
+        return VtTMenuState{{shown && IsCommandEnabled({}, command).enabled, false}, {}};
     }
     if (IsSelect(command))
     {
@@ -110,7 +106,7 @@ std::optional<VtTMenuState> VtCSimulationDataController::GetMenuState(std::uint3
     const bool framesOrStart = command >= store && command <= spoolForward;
     if (command != start && command != stop && !framesOrStart)
         return std::nullopt;
-    return VtTMenuState{IsCommandEnabled(selectedPoint, command), {}};
+    return VtTMenuState{IsCommandEnabled({}, command), {}};
 }
 
 bool VtCSimulationDataController::OnCmdMsg(std::uint32_t command)
@@ -143,20 +139,20 @@ void VtCSimulationDataController::Execute(std::uint32_t command)
     case refreshData:
         return Refresh();
     case firstFrame:
-        router.GotoFirst(selectedPoint);
+        router.GotoFirst();
         return;
     case previousFrame:
     case spoolBack:
-        GotoPrevious(selectedPoint);
+        GotoPrevious();
         return;
     case stopPlay:
         return StopPlay();
     case nextFrame:
     case spoolForward:
-        GotoNext(selectedPoint);
+        GotoNext();
         return;
     case lastFrame:
-        router.GotoLast(selectedPoint);
+        router.GotoLast();
         return;
     case playLoop:
         return PlayLoop();

@@ -1,48 +1,33 @@
-// The router's frame operations: take a frame, deliver it to the scene, tell the listeners.
+// The router's frame operations. Each takes a frame from a point and sends it on; how it goes from there stands once,
+// in `Send`.
 #include "simdata/SimulationDataRouter.h"
 
 #include <algorithm>
 
-#include "simdata/SimulationDataReceiver.h"
-
 using SimulationDataPoints::TRACK_UNSAFE;
 
-bool VtCSimulationDataRouter::FetchFrames()
+// Take, collect, deliver, notify: there is no other way to the scene.
+bool VtCSimulationDataRouter::Send(const Taken& taken, Way way)
 {
-    frames.RemoveAll();
-    // By index: a listener may deselect the point that it is being told about.
-    for (std::size_t i = 0; i < activePoints.size(); ++i)
-        if (!FetchFrame(*activePoints[i]))
-            return false;
+    if (!taken.frame)
+        return false;
+    if (way != Way::shown && taken.time)
+        clock.SetCurrentTime(*taken.time);
+    Collect(taken);
+    if (way == Way::online)
+        Notify(taken);
+    // A listener that deselects the point takes the frames away with it.
     Deliver();
+    if (way != Way::online)
+        Notify(taken);
     return true;
 }
 
-bool VtCSimulationDataRouter::FetchFrame(Point& point)
+// What belongs to the moment of the taken frame comes together here, that frame at the head.
+void VtCSimulationDataRouter::Collect(const Taken& taken)
 {
-    if (point.IsTimeDriven())
-    {
-        clock.TickClock();
-        point.SetSimulationTime(clock.GetCurrentTime());
-    }
-    unsigned long id = 0;
-    Frame* frame = point.GetCurrentFrame(id);
-    double time = 0.0;
-    const double* reported = nullptr;
-    if (frame)
-    {
-        frames.AddTail(frame);
-        int ignoredMessage = 0;
-        if (point.GetTrackSafety(ignoredMessage) != TRACK_UNSAFE)
-        {
-            time = frame->GetTimestamp();
-            clock.SetCurrentTime(time);
-            reported = &time;
-        }
-    }
-    NotifyFrame(point, frame, static_cast<int>(id), reported);
-    ReportMessages(point);
-    return frame != nullptr;
+    frames.RemoveAll();
+    frames.AddHead(taken.frame);
 }
 
 void VtCSimulationDataRouter::Deliver()
@@ -59,72 +44,83 @@ void VtCSimulationDataRouter::Deliver()
     receivers.ForEach([&](VtCSimulationDataReceiver& receiver) { receiver.ApplyFrames(frames, lists); });
 }
 
-void VtCSimulationDataRouter::DeliverAlone(Frame* frame)
+void VtCSimulationDataRouter::Notify(const Taken& taken)
 {
-    frames.RemoveAll();
-    frames.AddHead(frame);
-    Deliver();
+    changeObjects.ForEach(
+        [&](VtCSimulationDataChangeObject& listener)
+        {
+            listener.OnFrame(taken.point->GetName(), taken.frame, static_cast<int>(taken.id),
+                             taken.time ? &*taken.time : nullptr);
+        });
 }
 
-void VtCSimulationDataRouter::DeliverTimed(Point& point, Frame* frame, unsigned long id)
+VtCSimulationDataRouter::Taken VtCSimulationDataRouter::Timed(Point& point, Frame* frame, unsigned long id)
 {
-    const double time = frame->GetTimestamp();
-    const bool timed = point.GetTimestampsSupported() != 0;
-    DeliverAlone(frame);
-    NotifyFrame(point, frame, static_cast<int>(id), timed ? &time : nullptr);
+    Taken taken{&point, frame, id, {}};
+    if (frame && point.GetTimestampsSupported())
+        taken.time = frame->GetTimestamp();
+    return taken;
+}
+
+VtCSimulationDataRouter::Taken VtCSimulationDataRouter::TakeNewest(Point& point, double now)
+{
+    if (point.IsTimeDriven())
+        point.SetSimulationTime(now);
+    Taken taken{&point, nullptr, 0, {}};
+    taken.frame = point.GetCurrentFrame(taken.id);
+    int ignoredMessage = 0;
+    if (taken.frame && point.GetTrackSafety(ignoredMessage) != TRACK_UNSAFE)
+        taken.time = taken.frame->GetTimestamp();
+    return taken;
+}
+
+VtCSimulationDataRouter::Taken VtCSimulationDataRouter::TakeAt(Point& point, double now)
+{
+    unsigned long id = 0;
+    if (!point.GetTimestampsSupported())
+    {
+        Frame* next = point.GetNextFrame(id);
+        return Timed(point, next, id);
+    }
+    Frame* frame = point.GetAtTime(now);
+    return Timed(point, frame, frame ? static_cast<unsigned long>(frame->GetFrameId()) : 0);
+}
+
+bool VtCSimulationDataRouter::FetchFrames()
+{
+    frames.RemoveAll();
+    if (!active)
+        return true;
+    const Taken taken = TakeNewest(*active, clock.GetCurrentTime());
+    if (!Send(taken, Way::online))
+        Notify(taken);
+    ReportMessages();
+    return taken.frame != nullptr;
 }
 
 bool VtCSimulationDataRouter::GotoTime(const std::wstring& name)
 {
-    clock.TickClock();
     Point* point = Resolve(name);
-    if (!point)
-        return false;
+    return point && Send(TakeAt(*point, clock.GetCurrentTime()), Way::replay);
+}
 
+bool VtCSimulationDataRouter::SendNumbered(Point* point, long index, Way way)
+{
+    if (!point || index < 1 || !point->SetRecent(static_cast<unsigned long>(index)))
+        return false;
     unsigned long id = 0;
-    Frame* frame = nullptr;
-    if (point->GetTimestampsSupported())
-    {
-        frame = point->GetAtTime(clock.GetCurrentTime());
-        if (!frame)
-            return false;
-        id = static_cast<unsigned long>(frame->GetFrameId());
-        clock.SetCurrentTime(frame->GetTimestamp());
-    }
-    else
-    {
-        frame = point->GetNextFrame(id);
-        if (!frame)
-            return false;
-    }
-    DeliverTimed(*point, frame, id);
-    return true;
+    Frame* frame = point->GetRecent(id);
+    return Send(Timed(*point, frame, id), way);
 }
 
 bool VtCSimulationDataRouter::GotoFirst(const std::wstring& name)
 {
-    return GotoEnd(name, false);
+    return SendNumbered(Resolve(name), 1, Way::replay);
 }
 
 bool VtCSimulationDataRouter::GotoLast(const std::wstring& name)
 {
-    return GotoEnd(name, true);
-}
-
-bool VtCSimulationDataRouter::GotoEnd(const std::wstring& name, bool last)
-{
-    Point* point = Resolve(name);
-    unsigned long count = 0;
-    if (!point || !point->GetBufferedFrames(count) || !point->SetRecent(last ? count : 1))
-        return false;
-    unsigned long id = 0;
-    Frame* frame = point->GetRecent(id);
-    if (!frame)
-        return false;
-    if (point->GetTimestampsSupported())
-        clock.SetCurrentTime(frame->GetTimestamp());
-    DeliverTimed(*point, frame, id);
-    return true;
+    return SendNumbered(Resolve(name), static_cast<long>(GetBufferedFrames(name)), Way::replay);
 }
 
 bool VtCSimulationDataRouter::GotoFrame(const std::wstring& name, long index)
@@ -135,15 +131,7 @@ bool VtCSimulationDataRouter::GotoFrame(const std::wstring& name, long index)
 
 bool VtCSimulationDataRouter::ShowFrame(const std::wstring& name, long index)
 {
-    Point* point = Resolve(name);
-    if (!point || index < 1 || !point->SetRecent(static_cast<unsigned long>(index)))
-        return false;
-    unsigned long id = 0;
-    Frame* frame = point->GetRecent(id);
-    if (!frame)
-        return false;
-    DeliverTimed(*point, frame, id);
-    return true;
+    return SendNumbered(Resolve(name), index, Way::shown);
 }
 
 bool VtCSimulationDataRouter::GotoNext(const std::wstring& name)
@@ -165,11 +153,7 @@ bool VtCSimulationDataRouter::StepBack(const std::wstring& name)
     Point* point = Resolve(name);
     unsigned long id = 0;
     Frame* frame = point ? point->GetPreviousFrame(id) : nullptr;
-    if (!frame)
-        return false;
-    DeliverAlone(frame);
-    NotifyFrame(*point, frame, static_cast<int>(id), nullptr);
-    return true;
+    return Send({point, frame, id, {}}, Way::shown);
 }
 
 bool VtCSimulationDataRouter::RewindStep(const std::wstring& name)
@@ -197,9 +181,22 @@ bool VtCSimulationDataRouter::Spool(const std::wstring& name, bool backwards)
     int wrapped = 0;
     Frame* frame = backwards ? point->Rewind(start, elapsed, clock.GetSpeed(), id, wrapped)
                              : point->FastForward(start, elapsed, clock.GetSpeed(), id, wrapped);
-    if (!frame)
+    return Send(Timed(*point, frame, id), Way::shown);
+}
+
+bool VtCSimulationDataRouter::BeginSpool(double speed)
+{
+    if (!active)
         return false;
-    DeliverTimed(*point, frame, id);
+    active->SetFrameBufferRepeat(0);
+    if (!active->GetTimestampsSupported())
+        return true;
+    const std::optional<double> time = GetTimestampOfCurrent();
+    if (!time)
+        return false;
+    clock.SetCurrentTime(*time);
+    clock.SetSpeed(speed);
+    clock.StartOneWayClock(*time);
     return true;
 }
 
@@ -211,27 +208,8 @@ bool VtCSimulationDataRouter::FetchOnce(const std::wstring& name)
     const bool fetched = point->CanRefresh() && point->FetchOnce();
     channelsKnown = false;
     unsigned long id = 0;
-    if (Frame* frame = fetched ? point->GetRecent(id) : nullptr)
-    {
-        DeliverAlone(frame);
-        NotifyFrame(*point, frame, static_cast<int>(id), nullptr);
-    }
+    Frame* frame = fetched ? point->GetRecent(id) : nullptr;
+    Send({point, frame, id, {}}, Way::shown);
     ReportMessages(*point);
     return fetched;
-}
-
-bool VtCSimulationDataRouter::BeginSpool(double speed)
-{
-    const Point* point = GetActivePoint(0);
-    if (!point)
-        return false;
-    if (!point->GetTimestampsSupported())
-        return true;
-    const std::optional<double> time = GetTimestampOfCurrent();
-    if (!time)
-        return false;
-    clock.SetCurrentTime(*time);
-    clock.SetSpeed(speed);
-    clock.StartOneWayClock(*time);
-    return true;
 }

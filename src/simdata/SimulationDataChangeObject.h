@@ -1,13 +1,29 @@
 #pragma once
 
+#include <cstdint>
 #include <string>
-
-#include "simdata/SimulationState.h"
 
 namespace SimulationDataPoints
 {
 class VtCSimulationDataFrame;
 }
+
+/// Where the data come from: a source that streams, or the frames in the buffer.
+enum class VtESimulationMode : std::int32_t
+{
+    Online = 0,
+    Offline = 1,
+};
+
+/// What the replay does. Meaningful offline only.
+enum class VtEPlayState : std::int32_t
+{
+    PlayStopped = 0,
+    PlayOnce = 1,      ///< to the end of the buffer
+    PlayLoop = 2,      ///< starts again at the end
+    SpoolBackward = 3, ///< while the button is held down
+    SpoolForward = 4,
+};
 
 /// A listener of the router: dialogs derive from it to learn what happened to data points, mode, play state and frame.
 ///

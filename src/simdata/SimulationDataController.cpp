@@ -2,12 +2,14 @@
 
 #include <algorithm>
 
+#include "base/Paths.h"
 #include "base/Text.h"
+#include "host/Frame.h"
+#include "host/Messages.h"
+#include "host/Progress.h"
 #include "host/Storage.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
-#include "simdata/ActiveScene.h"
-#include "simdata/SimulationDataChangeObject.h"
 
 namespace
 {
@@ -16,20 +18,22 @@ namespace
 constexpr std::int32_t defaultSimulationFrames = 10000;
 constexpr std::int32_t defaultTrackFrames = 20000;
 
+constexpr const wchar_t* filePoint = L"File"; ///< the point that takes motion data files
+constexpr std::uint32_t messageNoFilePoint = 9030;
+constexpr std::uint32_t messageDataUnusable = 9031; ///< %1: the file
+constexpr std::uint32_t textLoadingData = 7004;
+constexpr long loadingData = 41; ///< the progress activity
+
 } // namespace
 
 VtCSimulationDataController::VtCSimulationDataController(const VtTSimulationServices& hostServices)
-    : services(hostServices), router(hostServices), runningIndicator(hostServices.variables, hostServices.navigator)
+    : services(hostServices), router(hostServices)
 {
     ReadBufferSettings();
     router.SetFrameBufferSize(static_cast<unsigned long>(simulationBufferFrames));
 }
 
-VtCSimulationDataController::~VtCSimulationDataController()
-{
-    if (auto* point = router.FindPoint(selectedPoint))
-        point->OnDeselect();
-}
+VtCSimulationDataController::~VtCSimulationDataController() = default;
 
 void VtCSimulationDataController::ReadBufferSettings()
 {
@@ -112,6 +116,7 @@ bool VtCSimulationDataController::Step()
     return true;
 }
 
+// False at the end of what plays or spools.
 bool VtCSimulationDataController::StepReplay()
 {
     switch (playState)
@@ -124,9 +129,9 @@ bool VtCSimulationDataController::StepReplay()
     case VtEPlayState::PlayLoop:
         return router.GotoTime() || router.ShowFrame({}, 1);
     case VtEPlayState::SpoolBackward:
-        return router.RewindStep();
+        return router.RewindStep() && router.GetRecent({}) > 1;
     case VtEPlayState::SpoolForward:
-        return router.ForwardStep();
+        return router.ForwardStep() && router.GetRecent({}) < router.GetBufferedFrames({});
     case VtEPlayState::PlayStopped:
         break;
     }
@@ -250,22 +255,54 @@ bool VtCSimulationDataController::SetBufferSizes(std::int32_t simulationFrames, 
     return true;
 }
 
-void VtCSimulationDataController::SetSelectedPoint(const std::wstring& name)
+void VtCSimulationDataController::UpdateRunningIndicator() const
 {
-    if (base::EqualsNoCase(name, selectedPoint))
-        return;
-    if (auto* old = router.FindPoint(selectedPoint))
-        old->OnDeselect();
-    selectedPoint = name;
-    if (auto* chosen = router.FindPoint(name))
-        chosen->OnSelect();
+    if (services.variables)
+        services.variables->SetBool(L"simulationRunning", (IsOnline() || IsPlaying()) && services.navigator &&
+                                                              services.navigator->IsTrackCurrent());
 }
 
 void VtCSimulationDataController::ChoosePoint(const std::wstring& name)
 {
-    SetSelectedPoint(name);
     if (name.empty())
-        router.DeselectPoint(router.GetActivePointName(0));
+        router.DeselectPoint(router.GetActivePointName());
     else
         router.SelectPoint(name);
+}
+
+bool VtCSimulationDataController::LoadMotionData(const std::wstring& path)
+{
+    auto* point = router.FindPoint(filePoint);
+    if (!point)
+    {
+        services.messages.ShowError(messageNoFilePoint);
+        return false;
+    }
+    if (services.progress)
+        services.progress->ConnectProgressActivity(loadingData, services.texts.GetText(textLoadingData),
+                                                   base::Wide(base::NativePath(path).filename().string()));
+    point->SetProgressBarActivityID(loadingData);
+    const bool loaded = point->Configure(L"MDF", path, 1, 0) != 0;
+    if (services.progress)
+        services.progress->DisconnectProgressActivity(loadingData);
+
+    if (const auto* stack = point->GetMessageStack())
+    {
+        services.messages.ReportStack(*stack);
+        point->ResetMessageStack();
+    }
+    else if (!loaded)
+        services.messages.ShowError(messageDataUnusable, base::Wide(base::NativePath(path).string()));
+    if (!loaded)
+        return false;
+
+    StopPlay();
+    Stop();
+    // A change of the active point is told by the router.
+    if (point != router.GetActivePoint())
+        ChoosePoint(filePoint);
+    else
+        router.NotifyConfiguration(point->GetConfigurationInfoText(0));
+    GotoFirst();
+    return true;
 }

@@ -7,12 +7,8 @@
 
 #include "simdata/ControllerCommands.h"
 #include "simdata/points/SimulationDataFrames.h"
-#include "simdata/RunningIndicator.h"
 #include "simdata/SimulationDataRouter.h"
 #include "simdata/SimulationServices.h"
-#include "simdata/SimulationState.h"
-
-class VtICustomizeSheet;
 
 /// The one place where the state of the simulation lives: the mode, online or offline, and the play state.
 ///
@@ -20,7 +16,7 @@ class VtICustomizeSheet;
 /// pass. Online, time is what the newest frame says; offline, the frames lie in the buffer of the active point and the
 /// replay follows the router's clock. Made once by the application object; owns the router.
 ///
-/// Where an operation takes the name of a point, an empty one stands for the first active point.
+/// Where an operation takes the name of a point, an empty one stands for the active point.
 class VtCSimulationDataController
 {
 public:
@@ -94,7 +90,7 @@ public:
 
     // Buffers
 
-    /// Capacity of the first active point, 0 if there is none.
+    /// Capacity of the active point, 0 if there is none.
     int GetFrameBufferSize() const;
 
     /// Null without an active point or a buffer.
@@ -110,13 +106,13 @@ public:
 
     // Points and commands
 
-    /// The user's choice in a list of points; an empty name is "none". Tells the old and the new point, and selects.
+    /// The user's choice in a list of points; an empty name is "none".
     void ChoosePoint(const std::wstring& name);
 
-    /// The list of points shows another entry than before, but not by the user's choice: the points are told, and
-    /// nothing is selected.
-    void SetSelectedPoint(const std::wstring& name);
-    const std::wstring& GetSelectedPoint() const { return selectedPoint; }
+    /// Loads a motion data file (inner form) into the point "File", makes that the active point and shows the first
+    /// frame. False, after a message, when the file can't be used: then the run that is loaded, the choice and a
+    /// replay that plays stay as they were.
+    bool LoadMotionData(const std::wstring& path);
 
     /// Who shows the customise sheet, not owned; null for nobody, and the command is disabled.
     void SetCustomizeSheet(VtICustomizeSheet* sheet) { customizeSheet = sheet; }
@@ -124,29 +120,26 @@ public:
     /// Carries out a command if it is enabled. True for every command that is the controller's, enabled or not.
     bool OnCmdMsg(std::uint32_t command);
 
-    /// Not const: a spool that has reached the end of the data ends here.
-    VtTCommandState IsCommandEnabled(const std::wstring& name, std::uint32_t command);
+    VtTCommandState IsCommandEnabled(const std::wstring& name, std::uint32_t command) const;
 
-    /// How a command shows in a menu, for the selected point; nothing for what isn't the controller's.
-    std::optional<VtTMenuState> GetMenuState(std::uint32_t command);
+    /// How a command shows in a menu, for the active point; nothing for what isn't the controller's.
+    std::optional<VtTMenuState> GetMenuState(std::uint32_t command) const;
 
 private:
     void ReadBufferSettings();
     void Play(VtEPlayState state);
     bool StepReplay();
-    void UpdateRunningIndicator() { runningIndicator.Update(IsOnline() || IsPlaying()); }
+    void UpdateRunningIndicator() const;
     VtTCommandState FrameCommandState(const std::wstring& name, std::uint32_t command) const;
     void Execute(std::uint32_t command);
     void Store();
 
     VtTSimulationServices services;
     VtCSimulationDataRouter router;
-    VtCRunningIndicator runningIndicator;
     VtESimulationMode mode = VtESimulationMode::Offline;
     VtEPlayState playState = VtEPlayState::PlayStopped;
     std::int32_t trackBufferFrames;
     std::int32_t simulationBufferFrames;
     double speed = 1.0;
-    std::wstring selectedPoint;
     VtICustomizeSheet* customizeSheet = nullptr;
 };

@@ -3,11 +3,10 @@
 #include "base/Text.h"
 #include "scene/MovableBodies.h"
 #include "scene/Scene3D.h"
-#include "simdata/ActiveScene.h"
-#include "simdata/ChannelLists.h"
 #include "simdata/InstrumentFeed.h"
 #include "simdata/points/SimulationDataFrame.h"
 #include "simdata/points/SimulationDataTracker.h"
+#include "simdata/SimulationServices.h"
 
 using namespace SimulationDataPoints;
 
@@ -113,7 +112,7 @@ long VtCSimulationDataReceiver::FindStream(std::size_t at, const VtIFedInstrumen
 
     Binding found{&instrument, signal, -1};
     for (std::size_t i = 0; i < channels.instruments.size() && found.position < 0; ++i)
-        if (base::EqualsNoCase(channels.instruments[i], signal))
+        if (base::EqualsNoCase(channels.instruments[i].name, signal))
             found.position = static_cast<long>(i);
     if (at >= bindings.size())
         bindings.resize(at + 1);

@@ -4,17 +4,27 @@
 #include <string>
 #include <vector>
 
+#include "simdata/points/ChannelDescription.h"
+
 namespace SimulationDataPoints
 {
 class VtCSimulationDataFrame;
 class VtCSimulationDataTracker;
 } // namespace SimulationDataPoints
 
-struct VtTChannelLists;
-class VtCMovableBodies;
 class VtIActiveScene;
 class VtIFedInstrument;
 class VtIInstrumentFeed;
+
+/// The channels of the active data point, in the order they have in its frames: poses, then instrument streams.
+struct VtTChannelLists
+{
+    std::vector<std::wstring> poses;
+    std::vector<SimulationDataPoints::VtTInstrumentStream> instruments; ///< with the units of their values
+
+    /// Another number after every reading of the lists, so that positions found in them can be kept until then.
+    std::uint64_t revision = 0;
+};
 
 /// Carries a delivery into the scene: moves the bodies and sets the instruments' values.
 ///
@@ -27,7 +37,7 @@ public:
     explicit VtCSimulationDataReceiver(const VtIActiveScene& scene) : activeScene(scene) {}
 
     /// Bodies first, each from the frame of its track: a body whose channel the frame doesn't have stays where it is.
-    /// Then the instruments, from the head frame. `channels` are those of the first active point.
+    /// Then the instruments, from the head frame. `channels` are those of the active point.
     void ApplyFrames(const SimulationDataPoints::VtCSimulationDataTracker& frames, const VtTChannelLists& channels);
 
 private:

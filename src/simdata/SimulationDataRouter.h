@@ -6,27 +6,31 @@
 #include <vector>
 
 #include "scene/SceneServices.h"
-#include "simdata/ChannelLists.h"
 #include "simdata/DataPointPlugins.h"
 #include "simdata/points/SimulationDataTracker.h"
 #include "simdata/RegistrationList.h"
 #include "simdata/ReplayClock.h"
+#include "simdata/SimulationDataChangeObject.h"
+#include "simdata/SimulationDataReceiver.h"
 #include "simdata/SimulationServices.h"
-#include "simdata/SimulationState.h"
 
 class VtCLoadProgressDisplay;
-class VtCSimulationDataChangeObject;
-class VtCSimulationDataReceiver;
 
 /// Owns the data points and stands between them and everything that wants frames.
 ///
-/// Loads the plug-ins, keeps the active point, runs the clock of the replay, takes a frame from the active point, gives
-/// it to the receivers and tells the listeners. It decides nothing about play state: the controller, which owns it,
-/// calls one of the frame operations in each step.
+/// Loads the plug-ins, keeps the active point, runs the clock of the replay, and sends frames on their way. That way is
+/// the same for all: a frame is taken from the active point, the frames of the delivery are collected, the receivers
+/// get them, the listeners are told. It decides nothing about play state: the controller, which owns it, ticks the
+/// clock and calls one of the frame operations in each step.
 ///
-/// Where an operation takes the name of a point, an empty one stands for the first active point; names are compared
-/// without regard to case. Frame operations are true if a frame was delivered. They must not be called from the
-/// destructor of a scene object, since receivers may replace scene data. In steady state they allocate nothing.
+///     router.SelectPoint(L"OffSim");           // the one place where the choice is kept
+///     router.GetClock().TickClock();
+///     if (!router.GotoTime())                  // the frame for the clock's time, delivered and told
+///         router.GotoLast();
+///
+/// Where an operation takes the name of a point, an empty one stands for the active point; names are compared without
+/// regard to case. Frame operations are true if a frame was delivered. They must not be called from the destructor of
+/// a scene object, since receivers may replace scene data. In steady state they allocate nothing.
 class VtCSimulationDataRouter : public VtIChannelSource
 {
 public:
@@ -73,11 +77,15 @@ public:
 
     /// Null for an empty or unknown name. Of several points with that name the last.
     Point* FindPoint(const std::wstring& name) const;
-    Point* FindActivePoint(const std::wstring& name) const;
-    const std::wstring& GetActivePointName(std::size_t index) const;
-    Point* GetActivePoint(std::size_t index) const;
 
-    /// Makes a source the active point. Nothing happens for the active one, and for what isn't a source.
+    /// The point that frames come from; null for none. At most one is active, with the index 0.
+    Point* GetActivePoint(std::size_t index = 0) const { return index == 0 ? active : nullptr; }
+
+    /// Its name, empty for none.
+    const std::wstring& GetActivePointName(std::size_t index = 0) const;
+
+    /// Makes a source the active point, and tells the point before it and the new one. Nothing happens for the active
+    /// one, and for what isn't a source.
     void SelectPoint(const std::wstring& name);
     void DeselectPoint(const std::wstring& name);
 
@@ -90,12 +98,14 @@ public:
     /// Pose channel names of a point, asked and split anew.
     std::vector<std::wstring> GetChannels(const std::wstring& name, int variant) const;
 
-    /// Pose channel names as they are stored at the source, and instrument names, of the first active point. Where
-    /// there are instrument names, the instruments of the active scene go by name from now on.
+    /// Pose channel names as they are stored at the source, and instrument streams, of the active point.
     VtTChannelLists GetChannelLists(int flag) const;
+
+    /// Reads the channels of the active point anew and shows it on bodies. Where there are instrument streams, the
+    /// instruments of the active scene go by name from now on.
     void RefreshChannelLists(int variant);
 
-    /// The channels of the first active point, kept between calls; empty lists without a point.
+    /// The channels of the active point, kept between calls; empty lists without a point.
     const VtTChannelLists& GetActiveChannels() const;
     const std::vector<std::wstring>* GetCurrentChannels() const override;
 
@@ -113,7 +123,8 @@ public:
     /// The online step. True also without an active point; false when the source has nothing.
     bool FetchFrames();
 
-    /// The replay step: the frame for the clock's time, or the next one of a point without time stamps.
+    /// The replay step: the frame for the clock's time, or the next one of a point without time stamps. The clock must
+    /// have been ticked before; likewise for `FetchFrames` and the spool.
     bool GotoTime(const std::wstring& name = {});
     bool GotoFirst(const std::wstring& name = {});
     bool GotoLast(const std::wstring& name = {});
@@ -127,7 +138,7 @@ public:
     bool GotoPrevious(const std::wstring& name = {});
     bool StepBack(const std::wstring& name = {});
 
-    /// The spool; the clock must have been ticked before.
+    /// The spool.
     bool RewindStep(const std::wstring& name = {});
     bool ForwardStep(const std::wstring& name = {});
 
@@ -140,12 +151,13 @@ public:
     double GetCurrentTime() const { return clock.GetCurrentTime(); }
     void SetCurrentTime(double time) { clock.SetCurrentTime(time); }
 
-    /// Starts the clock of a spool at the cursor. False without an active point or a time there.
+    /// Starts the clock of a spool at the cursor; the spool ends at the ends of the data, also after a loop. False
+    /// without an active point or a time there.
     bool BeginSpool(double speed);
 
     // Connection
 
-    /// Connects all active points. False, and the listeners aren't told, if one failed.
+    /// Connects the active point. False, and the listeners aren't told, if that failed.
     bool ConnectAll();
     void DisconnectAll();
 
@@ -154,11 +166,11 @@ public:
 
     // Messages of data points
 
-    /// Of the first active point; null without one, and while it has nothing to say.
+    /// Of the active point; null without one, and while it has nothing to say.
     SimulationDataPoints::VtCMessageStack* GetMessageStack() const;
     void ResetMessageStack();
 
-    /// Shows the messages of the first active point, if there are any, and resets its stack.
+    /// Shows the messages of the active point, if there are any, and resets its stack.
     void ReportMessages();
 
     // What a point says
@@ -169,29 +181,49 @@ public:
     /// Number of the frame at the cursor; 0 for none.
     unsigned long GetRecent(const std::wstring& name) const;
 
-    /// Time of the frame at the cursor of the first active point.
+    /// Time of the frame at the cursor of the active point.
     std::optional<double> GetTimestampOfCurrent() const;
     std::wstring GetConfigurationText(const std::wstring& name, int variant) const;
 
     /// True if both its source type and its source path are set.
     bool IsConfigured(const std::wstring& name) const;
 
-    /// Writes the buffer of the first active point to a motion data file. `type` is "MDF".
+    /// Writes the buffer of the active point to a motion data file. `type` is "MDF".
     bool StoreFrameBuffer(const std::wstring& path, const std::wstring& type);
 
 private:
+    /// How a frame goes on once it is taken.
+    enum class Way
+    {
+        online, ///< the clock is set to its time, and the listeners hear of it before the scene moves
+        replay, ///< the clock is set to its time
+        shown,  ///< the clock stays
+    };
+
+    /// A frame that was taken from a point.
+    struct Taken
+    {
+        Point* point = nullptr;
+        Frame* frame = nullptr; ///< null: the point had none
+        unsigned long id = 0;
+        std::optional<double> time; ///< nothing where times mean nothing
+    };
+
     Point* Resolve(const std::wstring& name) const;
+    void Activate(Point* point);
     void ReportMessages(Point& point);
     void ReadChannels(int variant) const;
     void RefreshReceivers();
     void ShowStatus();
-    void NotifyFrame(const Point& point, Frame* frame, int frameId, const double* time);
 
+    static Taken Timed(Point& point, Frame* frame, unsigned long id);
+    static Taken TakeNewest(Point& point, double now);
+    static Taken TakeAt(Point& point, double now);
+    bool Send(const Taken& taken, Way way);
+    void Collect(const Taken& taken);
     void Deliver();
-    void DeliverAlone(Frame* frame);
-    void DeliverTimed(Point& point, Frame* frame, unsigned long id);
-    bool FetchFrame(Point& point);
-    bool GotoEnd(const std::wstring& name, bool last);
+    void Notify(const Taken& taken);
+    bool SendNumbered(Point* point, long index, Way way);
     bool Spool(const std::wstring& name, bool backwards);
 
     VtTSimulationServices services;
@@ -200,8 +232,8 @@ private:
     VtCRegistrationList<VtCSimulationDataReceiver> receivers;
     VtCRegistrationList<VtCSimulationDataChangeObject> changeObjects;
     std::vector<VtTDataPointPtr> allPoints;
-    std::vector<Point*> activePoints; ///< at most one; also in `allPoints`
-    SimulationDataPoints::VtCSimulationDataTracker frames;
+    Point* active = nullptr;                               ///< also in `allPoints`
+    SimulationDataPoints::VtCSimulationDataTracker frames; ///< of the present delivery
     unsigned long frameBufferSize = Point::defaultBufferFrames;
     std::unique_ptr<VtCLoadProgressDisplay> loadProgress;
 

@@ -6,7 +6,6 @@
 
 #include "base/Text.h"
 #include "host/Frame.h"
-#include "simdata/CustomizeSheet.h"
 #include "simdata/SimulationDataController.h"
 
 namespace
@@ -35,14 +34,13 @@ constexpr std::uint32_t firstSpeedPosition = 5;
 
 constexpr const wchar_t* noPoint = L"<None>";
 
-// In the order in which their states are asked: a spool that is found at its end ends there.
 constexpr std::array commands{
-    ControllerCommand::pointList,    ControllerCommand::customizePoint, ControllerCommand::speedControl,
-    ControllerCommand::start,        ControllerCommand::stop,           ControllerCommand::customize,
-    ControllerCommand::store,        ControllerCommand::refreshData,    ControllerCommand::spoolBack,
-    ControllerCommand::spoolForward, ControllerCommand::firstFrame,     ControllerCommand::previousFrame,
-    ControllerCommand::stopPlay,     ControllerCommand::nextFrame,      ControllerCommand::lastFrame,
-    ControllerCommand::playLoop,     ControllerCommand::playOnce,
+    ControllerCommand::pointList,     ControllerCommand::customizePoint, ControllerCommand::speedControl,
+    ControllerCommand::start,         ControllerCommand::stop,           ControllerCommand::customize,
+    ControllerCommand::store,         ControllerCommand::refreshData,    ControllerCommand::firstFrame,
+    ControllerCommand::previousFrame, ControllerCommand::spoolBack,      ControllerCommand::stopPlay,
+    ControllerCommand::spoolForward,  ControllerCommand::nextFrame,      ControllerCommand::lastFrame,
+    ControllerCommand::playLoop,      ControllerCommand::playOnce,
 };
 
 // Comes with every frame: takes no memory once the text has had its length.
@@ -128,8 +126,6 @@ void VtCSimulationDataControllerDialog::RefillPoints()
         pointTexts.push_back(router.GetConfigurationText(name, 0));
         pointNames.push_back(std::move(name));
     }
-    chosenPoint = FindEntry(router.GetActivePointName(0));
-    ChosenPointChanged();
     ShowPoints();
 }
 
@@ -142,18 +138,17 @@ std::size_t VtCSimulationDataControllerDialog::FindEntry(const std::wstring& nam
     return 0;
 }
 
-void VtCSimulationDataControllerDialog::ChosenPointChanged()
+const std::wstring& VtCSimulationDataControllerDialog::GetChosenPoint() const
 {
-    chosenHasSettings = sheet && chosenPoint != 0 && sheet->CanCustomizePoint(GetChosenPoint());
-    // By the active point, not by the entry: while all points are announced one after the other none of them is to
-    // be taken for chosen.
-    controller.SetSelectedPoint(controller.GetRouter().GetActivePointName(0));
+    return controller.GetRouter().GetActivePointName();
 }
 
 void VtCSimulationDataControllerDialog::ShowPoints()
 {
+    const std::wstring& chosen = GetChosenPoint();
+    chosenHasSettings = sheet && !chosen.empty() && sheet->CanCustomizePoint(chosen);
     if (view)
-        view->ShowPoints(pointTexts, chosenPoint);
+        view->ShowPoints(pointTexts, FindEntry(chosen));
 }
 
 void VtCSimulationDataControllerDialog::OnPointChosen(std::size_t entry)
@@ -162,8 +157,6 @@ void VtCSimulationDataControllerDialog::OnPointChosen(std::size_t entry)
         return ShowPoints();
     const std::wstring name = pointNames[entry]; // the list changes while the point is selected
     controller.ChoosePoint(name);
-    chosenPoint = FindEntry(name);
-    ChosenPointChanged();
     ShowPoints();
     ReadCursor();
     UpdateControls();
@@ -172,20 +165,17 @@ void VtCSimulationDataControllerDialog::OnPointChosen(std::size_t entry)
 void VtCSimulationDataControllerDialog::OnConfigurationChanged(const std::wstring& text)
 {
     std::wstring name;
-    if (text.empty())
-        chosenPoint = 0;
-    else if (SimulationDataPoints::VtCSimulationDataPoint::ExtractConfigurationInfoText(text, &name, nullptr, nullptr))
+    if (SimulationDataPoints::VtCSimulationDataPoint::ExtractConfigurationInfoText(text, &name, nullptr, nullptr))
     {
-        chosenPoint = FindEntry(name);
-        if (chosenPoint == 0)
+        std::size_t entry = FindEntry(name);
+        if (entry == 0)
         {
-            chosenPoint = pointTexts.size();
+            entry = pointTexts.size();
             pointTexts.emplace_back();
             pointNames.push_back(name);
         }
-        pointTexts[chosenPoint] = text;
+        pointTexts[entry] = text;
     }
-    ChosenPointChanged();
     ShowPoints();
     ReadCursor();
     UpdateControls();
@@ -362,4 +352,37 @@ void VtCSimulationDataControllerDialog::TogglePlay()
     if (!GetState(playOnce).enabled && GetState(firstFrame).enabled)
         controller.OnCmdMsg(firstFrame);
     OnCommand(playOnce);
+}
+
+// The list of points is filled behind a hidden pane too; all else waits until the pane comes on show.
+void VtCSimulationDataChangeObjectController::OnDataPointsChanged(int)
+{
+    if (dialog && dialog->HasWindow())
+        dialog->RefillPoints();
+}
+
+void VtCSimulationDataChangeObjectController::OnModeChanged(VtESimulationMode mode)
+{
+    if (dialog && dialog->IsOnShow())
+        dialog->OnModeChanged(mode);
+}
+
+void VtCSimulationDataChangeObjectController::OnPlayStateChanged(const std::wstring& name, VtEPlayState)
+{
+    if (dialog && dialog->IsOnShow() && !name.empty() && base::EqualsNoCase(name, dialog->GetChosenPoint()))
+        dialog->UpdateControls();
+}
+
+void VtCSimulationDataChangeObjectController::OnFrame(const std::wstring& name,
+                                                      SimulationDataPoints::VtCSimulationDataFrame* frame, int frameId,
+                                                      const double* time)
+{
+    if (dialog && dialog->IsOnShow() && !name.empty() && frame)
+        dialog->OnFrame(frameId, time);
+}
+
+void VtCSimulationDataChangeObjectController::OnConfigurationChanged(const std::wstring& text)
+{
+    if (dialog && dialog->IsOnShow())
+        dialog->OnConfigurationChanged(text);
 }

@@ -6,9 +6,8 @@
 #include <string>
 #include <vector>
 
-#include "simdata/SimulationState.h"
+#include "simdata/SimulationDataChangeObject.h"
 #include "ui/ControllerDialogView.h"
-#include "ui/SimulationDataChangeObjectController.h"
 
 namespace host
 {
@@ -16,8 +15,31 @@ class UserInterface;
 }
 
 class VtCSimulationDataController;
+class VtCSimulationDataControllerDialog;
 class VtICustomizeSheet;
 struct VtTCommandState;
+
+/// Passes on to the controller's dialog what the router tells, as far as the dialog's window is there to show it.
+class VtCSimulationDataChangeObjectController : public VtCSimulationDataChangeObject
+{
+public:
+    explicit VtCSimulationDataChangeObjectController(VtCSimulationDataControllerDialog* listeningDialog)
+        : dialog(listeningDialog)
+    {
+    }
+
+    void OnDataPointsChanged(int) override;
+    void OnModeChanged(VtESimulationMode mode) override;
+    void OnPlayStateChanged(const std::wstring& name, VtEPlayState state) override;
+    void OnFrame(const std::wstring& name, SimulationDataPoints::VtCSimulationDataFrame* frame, int frameId,
+                 const double* time) override;
+    void OnDataPointSelected(const std::wstring& text) override { OnConfigurationChanged(text); }
+    void OnDataPointCleared(const std::wstring& text) override { OnConfigurationChanged(text); }
+    void OnConfigurationChanged(const std::wstring& text) override;
+
+private:
+    VtCSimulationDataControllerDialog* dialog; ///< null: nobody is told
+};
 
 /// The controller's dialog without a toolkit: all that it shows and all that its controls do.
 ///
@@ -102,8 +124,8 @@ public:
     /// Shows the state of every control.
     void UpdateControls();
 
-    /// Empty for the entry "<None>".
-    const std::wstring& GetChosenPoint() const { return pointNames[chosenPoint]; }
+    /// The active point, which the list shows as its choice; empty for the entry "<None>".
+    const std::wstring& GetChosenPoint() const;
     double GetSpeedFactor() const { return speedFactor; }
 
 private:
@@ -112,7 +134,6 @@ private:
     bool CanSeek() const;
     std::size_t FindEntry(const std::wstring& name) const;
     void ShowPoints();
-    void ChosenPointChanged();
     void ShowFrame();
     void ReadCursor();
     void CommitFrameNumber();
@@ -132,7 +153,6 @@ private:
 
     std::vector<std::wstring> pointTexts; ///< "<None>", then the configuration text of each source
     std::vector<std::wstring> pointNames; ///< their names, beginning with ""
-    std::size_t chosenPoint = 0;
     bool chosenHasSettings = false;
     std::uint32_t speedPosition;
     bool ran = false;             ///< a run or replay was seen, and its end has not been shown yet

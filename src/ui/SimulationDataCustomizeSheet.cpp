@@ -5,7 +5,6 @@
 
 #include "base/Text.h"
 #include "host/Messages.h"
-#include "host/Progress.h"
 #include "host/PropertySheets.h"
 #include "host/Questions.h"
 #include "simdata/points/PropertyPage.h"
@@ -20,8 +19,6 @@ namespace
 
 constexpr std::uint32_t textSheetTitle = 6893;
 constexpr std::uint32_t textPointTitle = 6903;
-constexpr std::uint32_t textLoading = 7004;
-constexpr long loadActivity = 41;
 
 constexpr const wchar_t* motionDataFilter = L"Motion Data file (*.mdf)|*.mdf||";
 
@@ -29,31 +26,6 @@ bool IsFilePoint(const std::wstring& name)
 {
     return base::EqualsNoCase(name, L"File");
 }
-
-/// The activity of loading a motion data file, as long as this stands.
-class LoadActivity
-{
-public:
-    LoadActivity(host::Progress* hostProgress, const host::Texts& texts) : progress(hostProgress)
-    {
-        if (!progress)
-            return;
-        progress->ConnectProgressActivity(loadActivity, {}, texts.GetText(textLoading));
-        progress->SetProgresStepCount(loadActivity, 1);
-    }
-    ~LoadActivity()
-    {
-        if (!progress)
-            return;
-        progress->StepProgressActivity(loadActivity);
-        progress->DisconnectProgressActivity(loadActivity);
-    }
-    LoadActivity(const LoadActivity&) = delete;
-    LoadActivity& operator=(const LoadActivity&) = delete;
-
-private:
-    host::Progress* progress;
-};
 
 } // namespace
 
@@ -128,26 +100,15 @@ void VtCSimulationDataCustomizeSheet::CustomizePoint(const std::wstring& name)
     if (!controller.GetRouter().FindPoint(name) || !CanCustomizePoint(name))
         return;
     if (IsFilePoint(name))
-        ChooseFile(name);
+        ChooseFile();
     else
         ShowOwnPage(name);
 }
 
-void VtCSimulationDataCustomizeSheet::ChooseFile(const std::wstring& name)
+void VtCSimulationDataCustomizeSheet::ChooseFile()
 {
-    const std::optional<std::wstring> path = services.questions->AskOpenFile({{}, motionDataFilter, L"mdf", L"*.mdf"});
-    VtCSimulationDataRouter& router = controller.GetRouter();
-    VtCSimulationDataPoint* point = router.FindPoint(name);
-    if (!path || !point)
-        return;
-    controller.ChoosePoint(name);
-    {
-        const LoadActivity activity(services.progress, services.texts);
-        point->Configure(L"MDF", *path, 1, 0);
-    }
-    // Also for a file that couldn't be taken: the one before it is gone, and whoever shows the point must see that.
-    router.NotifyConfiguration(point->GetConfigurationInfoText(0));
-    router.ReportMessages();
+    if (const auto path = services.questions->AskOpenFile({{}, motionDataFilter, L"mdf", L"*.mdf"}))
+        controller.LoadMotionData(*path);
 }
 
 void VtCSimulationDataCustomizeSheet::ShowOwnPage(const std::wstring& name)

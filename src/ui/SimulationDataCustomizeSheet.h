@@ -1,11 +1,10 @@
 #pragma once
 
-#include "simdata/CustomizeSheet.h"
+#include "simdata/SimulationServices.h"
 
 namespace host
 {
 class MessageService;
-class Progress;
 class PropertySheets;
 class Questions;
 class Texts;
@@ -20,7 +19,6 @@ struct VtTCustomizeServices
     host::MessageService* messages = nullptr;
     host::PropertySheets* sheets = nullptr;
     host::Questions* questions = nullptr;
-    host::Progress* progress = nullptr;
 };
 
 /// The customise sheet of the controller and of its data points. Answers the controller's command as long as it lives,
@@ -41,7 +39,7 @@ public:
 
 private:
     void TellPoints(const std::wstring& activeName);
-    void ChooseFile(const std::wstring& name);
+    void ChooseFile();
     void ShowOwnPage(const std::wstring& name);
 
     VtCSimulationDataController& controller;

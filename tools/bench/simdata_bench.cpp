@@ -11,11 +11,10 @@
 #include "scene/MovableBodies.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
-#include "simdata/ActiveScene.h"
-#include "simdata/ChannelLists.h"
 #include "simdata/points/SimulationDataFrames.h"
 #include "simdata/points/SimulationDataTracker.h"
 #include "simdata/SimulationDataReceiver.h"
+#include "simdata/SimulationServices.h"
 #include "tests/support/FakeScene.h"
 
 using namespace SimulationDataPoints;

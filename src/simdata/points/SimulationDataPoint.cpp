@@ -185,6 +185,22 @@ int VtCSimulationDataPoint::GetInstrumentChannelNames(std::vector<std::wstring>&
     return static_cast<int>(names.size());
 }
 
+std::vector<VtTInstrumentStream> VtCSimulationDataPoint::GetInstrumentStreams(int flag) const
+{
+    std::vector<std::wstring> names;
+    GetInstrumentChannelNames(names, flag);
+    std::vector<VtTInstrumentStream> streams;
+    streams.reserve(names.size());
+    for (std::wstring& streamName : names)
+    {
+        const std::size_t at = streams.size();
+        const bool described =
+            description && at < description->instruments.size() && description->instruments[at].name == streamName;
+        streams.push_back({std::move(streamName), described ? description->instruments[at].unit : std::wstring()});
+    }
+    return streams;
+}
+
 void VtCSimulationDataPoint::GetBodyChannelNames(std::vector<std::wstring>& names, int) const
 {
     names.clear();

@@ -91,6 +91,10 @@ public:
     /// 1: replay loops; 0: it stops at the end. Holds for later buffers too. Always non-zero.
     int SetFrameBufferRepeat(int repeat);
 
+    /// The instrument streams, in the order of `GetInstrumentChannelNames`, with the units of their values where the
+    /// description knows them.
+    std::vector<VtTInstrumentStream> GetInstrumentStreams(int flag) const;
+
     /// Tells a time-driven point the present time, before it is asked for a frame.
     void SetSimulationTime(double t);
 

@@ -1,3 +1,5 @@
+#include <functional>
+
 #include "simdata/tests/SimulationFixture.h"
 
 using namespace simtest;
@@ -115,42 +117,49 @@ TEST_F(Controller, ChecksWhatRuns)
     };
     using enum VtEPlayState;
     const Case cases[] = {
-        {::playOnce, PlayOnce, 2, true},         {::playOnce, PlayOnce, 4, false},
-        {::playOnce, PlayLoop, 2, false},        {::playLoop, PlayLoop, 4, true},
-        {::playLoop, PlayOnce, 2, false},        {::spoolBack, SpoolBackward, 2, true},
-        {::spoolBack, SpoolForward, 2, false},   {::spoolForward, SpoolForward, 2, true},
-        {::spoolForward, PlayStopped, 2, false},
+        {::playOnce, PlayOnce, 2, true},          {::playOnce, PlayOnce, 4, false},
+        {::playOnce, PlayLoop, 2, false},         {::playLoop, PlayLoop, 4, true},
+        {::playLoop, PlayOnce, 2, false},         {::spoolBack, SpoolBackward, 2, true},
+        {::spoolBack, SpoolForward, 2, false},    {::spoolForward, SpoolForward, 2, true},
+        {::spoolForward, PlayStopped, 2, false},  {::spoolBack, SpoolBackward, 1, false},
+        {::spoolForward, SpoolForward, 4, false},
     };
     for (const Case& c : cases)
     {
         Force(c.state, c.cursor);
         EXPECT_EQ(Checked(c.command), c.checked) << c.command << " on frame " << c.cursor;
-        EXPECT_EQ(controller.GetPlayState(), c.state);
+        EXPECT_EQ(controller.GetPlayState(), c.state) << "a question ends nothing";
     }
 }
 
-TEST_F(Controller, EndsASpoolThatReachedTheEnd)
-{
-    Force(VtEPlayState::SpoolBackward, 1);
-    EXPECT_FALSE(Checked(spoolBack));
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayStopped);
-    Force(VtEPlayState::SpoolForward, 4);
-    EXPECT_FALSE(Enabled(spoolForward));
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayStopped);
-    // The other button of the pair leaves it alone.
-    Force(VtEPlayState::SpoolForward, 4);
-    EXPECT_TRUE(Enabled(spoolBack));
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::SpoolForward);
-}
-
-TEST_F(Controller, DisablesEverythingWithoutConfigurationOrOnline)
+TEST_F(Controller, AsksEachPointForItsOwnCommands)
 {
     const std::uint32_t frameCommands[] = {start, store,    refreshData, first,    previous,  next,        last,
                                            video, playLoop, playOnce,    stopPlay, spoolBack, spoolForward};
+    Point& other = Add(L"Other");
+    other.SetChannels({L"Body"});
+    other.Fill({0.0});
     live.SetRecent(2);
+    EXPECT_TRUE(Enabled(first));
+    const auto enabled = [&](const wchar_t* name, std::uint32_t command)
+    { return controller.IsCommandEnabled(name, command).enabled; };
+    EXPECT_FALSE(enabled(L"Other", first)) << "its cursor is on the first of one frame";
+    EXPECT_FALSE(enabled(L"Other", playOnce));
+    EXPECT_TRUE(enabled(L"other", playLoop));
+    EXPECT_TRUE(enabled(L"", first)) << "without a name the active point answers";
+    other.refreshes = true;
+    EXPECT_TRUE(enabled(L"Other", refreshData));
+    EXPECT_FALSE(enabled(L"", refreshData));
+    other.StartBuffer();
+    for (const std::uint32_t command : {playLoop, store, next})
+        EXPECT_FALSE(enabled(L"Other", command)) << "without a frame";
+
     live.path.clear();
     for (const std::uint32_t command : frameCommands)
+    {
         EXPECT_FALSE(Enabled(command)) << command << " not configured";
+        EXPECT_FALSE(enabled(L"unknown", command)) << command;
+    }
     live.path = L"bench";
     controller.Start();
     for (const std::uint32_t command : frameCommands)
@@ -159,126 +168,131 @@ TEST_F(Controller, DisablesEverythingWithoutConfigurationOrOnline)
     EXPECT_TRUE(Enabled(stop));
 }
 
-TEST_F(Controller, DisablesPlayWithASingleOrNoFrame)
-{
-    live.Fill({0.0});
-    EXPECT_FALSE(Enabled(playOnce));
-    EXPECT_TRUE(Enabled(playLoop));
-    live.StartBuffer();
-    EXPECT_FALSE(Enabled(playLoop));
-    EXPECT_FALSE(Enabled(store));
-    EXPECT_FALSE(Enabled(next));
-}
-
 TEST_F(Controller, GoesOnlineAndOffline)
 {
-    controller.Start();
-    EXPECT_EQ(Taken(), (Log{"connect Live", "mode 0"}));
-    EXPECT_TRUE(controller.IsOnline());
-    controller.Start();
-    EXPECT_EQ(Taken(), Log{}) << "online already";
-    controller.SetPlayState(L"Live", VtEPlayState::PlayLoop);
-    EXPECT_FALSE(controller.HasPlayState()) << "play states are for offline";
-    controller.Stop();
-    EXPECT_EQ(Taken(), (Log{"disconnect Live", "mode 1"}));
-    EXPECT_FALSE(controller.IsOnline());
-}
+    struct Change
+    {
+        const char* name;
+        std::function<void(VtCSimulationDataController&)> change;
+        Log told;
+        bool online;
+    };
+    using enum VtESimulationMode;
+    const Change changes[] = {
+        {"start", [](auto& c) { c.Start(); }, {"connect Live", "mode 0"}, true},
+        {"again", [](auto& c) { c.Start(); }, {}, true},
+        {"no play states online", [](auto& c) { c.SetPlayState(L"Live", VtEPlayState::PlayLoop); }, {}, true},
+        {"no steps by hand", [](auto& c) { c.GotoNext() || c.GotoPrevious(); }, {}, true},
+        {"stop", [](auto& c) { c.Stop(); }, {"disconnect Live", "mode 1"}, false},
+        {"quietly on", [](auto& c) { c.SetModeQuietly(Online); }, {"connect Live", "mode 0", "mode 0"}, true},
+        {"quietly off, still connected", [](auto& c) { c.SetModeQuietly(Offline); }, {"mode 1"}, false},
+        {"nothing runs without a point",
+         [](auto& c) { c.Reset(), c.Start(); },
+         {"deselect Live", "disconnect Live", "cleared "},
+         false},
+    };
+    for (const Change& change : changes)
+    {
+        SCOPED_TRACE(change.name);
+        change.change(controller);
+        EXPECT_EQ(Taken(), change.told);
+        EXPECT_EQ(controller.IsOnline(), change.online);
+        EXPECT_FALSE(controller.HasPlayState());
+    }
+    EXPECT_EQ(userInterface.waitCursors, 0) << "each begun was ended";
 
-TEST_F(Controller, StaysOfflineWhenThePointDoesNotConnect)
-{
+    router.SelectPoint(L"Live");
     live.connects = false;
     controller.Start();
     EXPECT_FALSE(controller.IsOnline());
-    EXPECT_EQ(Taken(), (Log{"connect Live"}));
-    EXPECT_EQ(messages.stacks.size(), 1U);
+    EXPECT_EQ(messages.stacks.size(), 1U) << "with the reason";
     EXPECT_EQ(live.GetMessageStack(), nullptr);
-}
 
-TEST_F(Controller, DoesNotStartWithoutAPoint)
-{
-    router.Clear();
-    log.clear();
-    controller.Start();
-    EXPECT_FALSE(controller.IsOnline());
-    EXPECT_EQ(Taken(), Log{});
-}
-
-TEST_F(Controller, GoesOfflineQuietlyWithoutTheConnection)
-{
-    controller.SetModeQuietly(VtESimulationMode::Online);
-    EXPECT_EQ(Taken(), (Log{"connect Live", "mode 0", "mode 0"}));
-    controller.SetModeQuietly(VtESimulationMode::Offline);
-    EXPECT_EQ(Taken(), (Log{"mode 1"})) << "stays connected";
-    EXPECT_FALSE(controller.IsOnline());
-}
-
-TEST_F(Controller, StepsOnlineUntilTheSourceFails)
-{
+    live.connects = true;
     controller.Start();
     log.clear();
-    EXPECT_TRUE(controller.Step());
-    live.streams = false;
-    EXPECT_FALSE(controller.Step());
-    EXPECT_TRUE(controller.IsOnline()) << "the frame cycle tries again";
-    EXPECT_EQ(messages.stacks.size(), 1U) << "told once a step";
-    live.streams = true;
-    EXPECT_TRUE(controller.Step());
+    for (const bool streams : {true, false, true})
+    {
+        live.streams = streams;
+        EXPECT_EQ(controller.Step(), streams);
+        EXPECT_TRUE(controller.IsOnline()) << "the frame cycle tries again";
+    }
     EXPECT_EQ(Taken(), (Log{"frame 4 1.04", "no frame", "frame 4 1.04"}));
+    EXPECT_EQ(messages.stacks.size(), 2U) << "told once a step";
+    controller.Reset();
+    EXPECT_FALSE(controller.IsOnline());
+    EXPECT_EQ(router.GetActivePoint(), nullptr);
 }
 
 TEST_F(Controller, PlaysOnceToTheLastFrameAndStops)
 {
     live.SetRecent(1);
-    controller.PlayOnce();
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayOnce);
+    controller.PlayLoop();
+    controller.StopPlay();
+    log.clear();
+    controller.PlayOnce(); // after a loop too it ends: the buffer doesn't repeat any more
     std::vector<bool> playing;
     for (int i = 0; i < 6; ++i)
     {
         EXPECT_TRUE(controller.Step());
         playing.push_back(controller.IsPlaying());
+        EXPECT_FALSE(playing.back() && (controller.GotoNext() || controller.GotoPrevious())) << "steps by hand";
         clock.Advance(0.015);
     }
     // At 1.000, 1.015, 1.030 and, beyond the end, 1.045 s; afterwards nothing runs.
     EXPECT_EQ(Taken(),
               (Log{"play Live 1", "frame 1 1", "frame 2 1.01", "frame 3 1.02", "frame 4 1.04", "play Live 0"}));
     EXPECT_EQ(playing, (std::vector<bool>{true, true, true, false, false, false}));
-    EXPECT_EQ(router.GetRecent(L"Live"), 4UL);
     EXPECT_FALSE(Enabled(playOnce));
     EXPECT_TRUE(Enabled(first));
+
+    live.StartBuffer();
+    for (const bool loop : {false, true})
+    {
+        loop ? controller.PlayLoop() : controller.PlayOnce();
+        log.clear();
+        EXPECT_TRUE(controller.Step());
+        EXPECT_EQ(Taken(), (Log{"play Live 0"})) << "over an empty buffer";
+    }
 }
 
 TEST_F(Controller, PlaysFromTheCursorAtItsSpeed)
 {
     live.Fill({0, 1, 2, 3, 4, 5, 6, 7, 8, 9});
-    for (const double speed : {0.5, 2.0})
+    struct Run
     {
-        SCOPED_TRACE(speed);
-        live.SetRecent(4); // at 3 s
-        controller.SetSpeed(speed);
+        const char* name;
+        double speed;
+        std::function<void(VtCSimulationDataController&)> play;
+        double seconds, time; ///< from 3 s on
+    };
+    const auto once = [](auto& c) { c.PlayOnce(); };
+    const auto loop = [](auto& c) { c.PlayLoop(); };
+    const auto record = [](auto& c) { c.PlayForRecording(3.0, 0.5), c.SetCurrentTime(9.0); };
+    const Run runs[] = {
+        {"once, half as fast", 0.5, once, 2.0, 4.0},
+        {"once, twice as fast", 2.0, once, 2.0, 7.0},
+        {"a loop, half as fast", 0.5, loop, 2.0, 4.0},
+        {"a loop, twice as fast", 2.0, loop, 2.0, 7.0},
+        {"a loop, over the end", 2.0, loop, 4.0, 2.0}, // 11 s: 2 beyond the end at 9
+        {"a recorder's time, scaled once, and no wall clock", 4.0, record, 100.0, 6.0},
+    };
+    for (const Run& run : runs)
+    {
+        SCOPED_TRACE(run.name);
+        live.SetRecent(4);
+        controller.SetSpeed(run.speed);
         router.GetClock().SetSpeed(9.0); // a connection or a recording leaves its own
-        controller.PlayOnce();
-        clock.Advance(2.0);
+        run.play(controller);
+        clock.Advance(run.seconds);
         controller.Step();
-        EXPECT_EQ(router.GetCurrentTime(), 3.0 + 2.0 * speed);
-        controller.StopPlay();
+        EXPECT_EQ(router.GetCurrentTime(), run.time);
+        EXPECT_TRUE(controller.IsPlaying());
+        log.clear();
+        controller.ResetPlayState();
+        EXPECT_EQ(Taken(), Log{}) << "nobody is told";
+        EXPECT_FALSE(controller.HasPlayState());
     }
-    controller.StopPlay();
-    EXPECT_EQ(Taken(), (Log{"play Live 1", "frame 5 4", "play Live 0", "play Live 1", "frame 8 7", "play Live 0"}));
-}
-
-TEST_F(Controller, LoopsByTheClock)
-{
-    live.Fill({0, 1, 2, 3, 4});
-    live.SetRecent(4);
-    controller.PlayLoop();
-    log.clear();
-    for (int i = 0; i < 4; ++i)
-    {
-        controller.Step();
-        clock.Advance(0.75);
-    }
-    EXPECT_EQ(Taken(), (Log{"frame 4 3", "frame 4 3", "frame 1 0", "frame 2 1"})); // 3, 3.75, 0.5 and 1.25 s
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayLoop);
 }
 
 TEST_F(Controller, LoopsByNumberWithoutTimeStamps)
@@ -294,82 +308,34 @@ TEST_F(Controller, LoopsByNumberWithoutTimeStamps)
     EXPECT_TRUE(controller.IsPlaying());
 }
 
-TEST_F(Controller, StopsPlayingOverAnEmptyBuffer)
-{
-    live.StartBuffer();
-    for (const bool loop : {false, true})
-    {
-        loop ? controller.PlayLoop() : controller.PlayOnce();
-        log.clear();
-        EXPECT_TRUE(controller.Step());
-        EXPECT_EQ(Taken(), (Log{"play Live 0"}));
-    }
-}
-
-TEST_F(Controller, SpoolsWhileTheButtonIsDown)
+TEST_F(Controller, SpoolsToTheEndsAndStopsThere)
 {
     live.Fill({0, 1, 2, 3, 4});
-    live.SetRecent(4);
-    ASSERT_TRUE(controller.BeginSpool(1.0));
-    controller.SetPlayState(L"Live", VtEPlayState::SpoolBackward);
-    clock.Advance(2.0);
-    controller.Step();
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::SpoolBackward);
-    clock.Advance(2.0); // one second beyond the start: shown once, then the spool ends
-    controller.Step();
-    controller.Step();
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayStopped);
-    EXPECT_EQ(Taken(), (Log{"frame 2 1", "frame 1 0", "play Live 0"}));
-    controller.SetPlayState(L"", VtEPlayState::SpoolForward);
-    EXPECT_FALSE(controller.HasPlayState()) << "a state needs a point";
-}
-
-TEST_F(Controller, ResetEndsEverything)
-{
     controller.PlayLoop();
-    controller.Reset();
-    EXPECT_FALSE(controller.HasPlayState());
-    EXPECT_EQ(router.GetActivePoint(0), nullptr);
-
-    router.SelectPoint(L"Live");
-    controller.Start();
-    controller.Reset();
-    EXPECT_FALSE(controller.IsOnline());
-    EXPECT_EQ(router.GetActivePoint(0), nullptr);
-}
-
-TEST_F(Controller, StepsByHandOnlyWhileNothingRuns)
-{
-    live.SetRecent(2);
-    EXPECT_TRUE(controller.GotoNext());
-    EXPECT_TRUE(controller.GotoPrevious());
-    controller.PlayLoop();
-    EXPECT_FALSE(controller.GotoNext());
-    EXPECT_FALSE(controller.GotoPrevious());
-    controller.StopPlay();
-    controller.Start();
-    EXPECT_FALSE(controller.GotoNext());
-}
-
-TEST_F(Controller, ShowsARefreshAsAShortRun)
-{
-    live.refreshes = true;
-    controller.Refresh();
-    EXPECT_EQ(Taken(), (Log{"mode 0", "fetch Live", "frame 1", "mode 1"}));
-}
-
-TEST_F(Controller, RecordsByTheScaledClock)
-{
-    controller.PlayForRecording(1.0, 1.0);
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayLoop);
-    clock.Advance(10.0);
-    controller.SetCurrentTime(1.02);
-    log.clear();
-    controller.Step();
-    EXPECT_EQ(Taken(), (Log{"frame 3 1.02"}));
-    controller.ResetPlayState();
-    EXPECT_EQ(Taken(), Log{}) << "nobody is told";
-    EXPECT_FALSE(controller.HasPlayState());
+    controller.StopPlay(); // a loop before makes no difference
+    struct Case
+    {
+        VtEPlayState state;
+        Log told;
+    };
+    const Case cases[] = {{VtEPlayState::SpoolBackward, {"frame 2 1", "frame 1 0", "play Live 0"}},
+                          {VtEPlayState::SpoolForward, {"frame 4 3", "frame 5 4", "play Live 0"}}};
+    for (const Case& c : cases)
+    {
+        live.SetRecent(3);
+        ASSERT_TRUE(controller.BeginSpool(1.0));
+        controller.SetPlayState(L"", c.state);
+        EXPECT_FALSE(controller.HasPlayState()) << "a state needs a point";
+        controller.SetPlayState(L"Live", c.state);
+        log.clear();
+        for (const double seconds : {1.0, 5.0, 1.0})
+        {
+            clock.Advance(seconds);
+            controller.Step();
+        }
+        EXPECT_EQ(Taken(), c.told);
+        EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayStopped);
+    }
 }
 
 TEST_F(Controller, CarriesOutItsCommandsAndNoOthers)
@@ -399,7 +365,7 @@ TEST_F(Controller, CarriesOutItsCommandsAndNoOthers)
         {stop, {"disconnect Live", "mode 1"}},
         {refreshData, {"mode 0", "fetch Live", "frame 1", "mode 1"}},
         {38719, {}}, // there is no second source
-        {38717, {"disconnect Live", "cleared "}},
+        {38717, {"deselect Live", "disconnect Live", "cleared "}},
         {38718, {"select Live", "selected Live|TEST|bench"}},
     };
     for (const Case& c : cases)
@@ -413,6 +379,13 @@ TEST_F(Controller, CarriesOutItsCommandsAndNoOthers)
     const int asked = live.channelQuestions;
     EXPECT_TRUE(controller.OnCmdMsg(38713));
     EXPECT_GT(live.channelQuestions, asked);
+
+    EXPECT_TRUE(controller.OnCmdMsg(store));
+    ASSERT_EQ(questions.asked.size(), 1U);
+    EXPECT_EQ(questions.asked[0].filter, L"Motion Data file (*.mdf)|*.mdf||");
+    EXPECT_EQ(questions.asked[0].defaultExtension, L"mdf");
+    EXPECT_EQ(questions.asked[0].initialName, L"*.mdf");
+    EXPECT_FALSE(messages.Has(host::Severity::error, 530)) << "declined";
 }
 
 TEST_F(Controller, ListsTheSourcesInItsMenu)
@@ -428,34 +401,6 @@ TEST_F(Controller, ListsTheSourcesInItsMenu)
     EXPECT_FALSE(controller.GetMenuState(38717)->checked);
     controller.Start();
     EXPECT_FALSE(controller.GetMenuState(38719)->enabled);
-}
-
-TEST_F(Controller, TellsPointsThatTheyAreChosen)
-{
-    Add(L"Other");
-    controller.ChoosePoint(L"Live");
-    EXPECT_EQ(Taken(), (Log{"select Live"}));
-    controller.ChoosePoint(L"live");
-    EXPECT_EQ(Taken(), Log{});
-    controller.ChoosePoint(L"Other");
-    EXPECT_EQ(Taken(), (Log{"deselect Live", "select Other", "selected Other|TEST|bench"}));
-    controller.ChoosePoint(L"");
-    EXPECT_EQ(Taken(), (Log{"deselect Other", "disconnect Other", "cleared "}));
-}
-
-TEST_F(Controller, AsksWhereToStore)
-{
-    controller.OnCmdMsg(store);
-    ASSERT_EQ(questions.asked.size(), 1U);
-    EXPECT_EQ(questions.asked[0].filter, L"Motion Data file (*.mdf)|*.mdf||");
-    EXPECT_EQ(questions.asked[0].defaultExtension, L"mdf");
-    EXPECT_EQ(questions.asked[0].initialName, L"*.mdf");
-    EXPECT_FALSE(messages.Has(host::Severity::error, 530)) << "declined";
-
-    questions.answer = L"out\\run.mdf"; // there is no File module here to write with
-    controller.OnCmdMsg(store);
-    EXPECT_TRUE(messages.Has(host::Severity::error, 530));
-    EXPECT_EQ(messages.shown.back().first, L"out\\run.mdf");
 }
 
 TEST_F(Controller, KeepsBufferSizesWithTheHost)
@@ -503,6 +448,44 @@ TEST_F(Controller, LightsTheIndicatorForTheTrackInTheTreeOnly)
     navigator.track = false;
     other.PlayLoop();
     EXPECT_FALSE(shown);
+}
+
+// A point that takes one file and no other.
+class FilePoint : public Point
+{
+public:
+    using Point::Point;
+    int Configure(const std::wstring&, const std::wstring& newPath, int, int) override
+    {
+        if (newPath == L"good.mdf")
+            return path = newPath, 1;
+        Say(L"no motion data");
+        return 0;
+    }
+};
+
+TEST_F(Controller, LeavesTheRunAloneWhenAFileCannotBeLoaded)
+{
+    EXPECT_FALSE(controller.LoadMotionData(L"good.mdf"));
+    EXPECT_TRUE(messages.Has(host::Severity::error, 9030)) << "there is no point for files";
+    auto& file = static_cast<FilePoint&>(router.AddPoint(VtTDataPointPtr(new FilePoint(L"File", &log))));
+    file.SetChannels({L"Body"});
+    file.Fill({5.0, 6.0});
+    file.SetRecent(2);
+    controller.PlayLoop();
+    log.clear();
+    EXPECT_FALSE(controller.LoadMotionData(L"bad.mdf"));
+    EXPECT_EQ(Taken(), Log{}) << "neither choice nor replay have changed";
+    EXPECT_EQ(messages.stacks.size(), 1U);
+
+    const Log loaded = {"play Live 0", "deselect Live", "select File", "selected File|TEST|good.mdf", "frame 1 5"};
+    EXPECT_TRUE(controller.LoadMotionData(L"good.mdf"));
+    EXPECT_EQ(Taken(), loaded);
+    EXPECT_FALSE(controller.LoadMotionData(L"bad.mdf"));
+    EXPECT_EQ(Taken(), Log{});
+    EXPECT_TRUE(controller.LoadMotionData(L"good.mdf"));
+    EXPECT_EQ(Taken(), (Log{"selected File|TEST|good.mdf", "frame 1 5"})) << "another file of the same point";
+    EXPECT_FALSE(progress.activities[41].connected);
 }
 
 } // namespace

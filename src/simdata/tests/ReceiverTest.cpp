@@ -7,7 +7,6 @@
 #include "scene/MovableBodies.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
-#include "simdata/ChannelLists.h"
 #include "simdata/tests/SimulationFixture.h"
 #include "tests/support/FakeScene.h"
 #include "tests/support/HeapCount.h"
@@ -209,7 +208,7 @@ TEST_F(Receiver, FeedsInstrumentsByName)
 TEST_F(Receiver, GivesZeroForAStreamThatIsAPose)
 {
     Instrument& instrument = instruments.Add(L"Pose");
-    Apply({NumberedFrame(2)}, VtTChannelLists{{}, {L"Pose"}, 77});
+    Apply({NumberedFrame(2)}, VtTChannelLists{{}, {{L"Pose", {}}}, 77});
     EXPECT_EQ(instrument.value.value, 0.0);
     EXPECT_EQ(instrument.value.type, 10);
 }

@@ -17,7 +17,7 @@ void Point::SetChannels(std::vector<std::wstring> poses, std::vector<std::wstrin
     auto channels = std::make_shared<VtTChannelDescription>();
     channels->poses = std::move(poses);
     for (std::wstring& stream : instruments)
-        channels->instruments.push_back({std::move(stream), {}});
+        channels->instruments.push_back({std::move(stream), L"m/s"});
     channels->timeStamps = stamped;
     channels->trackSafety = safety;
     SetDescription(channels);

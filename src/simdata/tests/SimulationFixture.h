@@ -6,7 +6,6 @@
 
 #include <gtest/gtest.h>
 
-#include "simdata/ActiveScene.h"
 #include "simdata/InstrumentFeed.h"
 #include "simdata/points/SimulationDataPoint.h"
 #include "simdata/SimulationDataChangeObject.h"

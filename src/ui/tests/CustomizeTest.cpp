@@ -210,6 +210,8 @@ TEST_F(Customize, ShowsTheOwnPageOfTheChosenPoint)
 TEST_F(Customize, AsksForTheFileOfTheFilePoint)
 {
     Point& file = Add(L"File");
+    file.SetChannels({L"Body"});
+    file.Fill({0.0});
     dialog->RefillPoints();
     dialog->OnPointChosen(2);
     ASSERT_TRUE(view.Enabled(customizePoint));
@@ -217,20 +219,10 @@ TEST_F(Customize, AsksForTheFileOfTheFilePoint)
     ASSERT_EQ(questions.asked.size(), 1U);
     EXPECT_EQ(questions.asked[0].filter, L"Motion Data file (*.mdf)|*.mdf||");
     EXPECT_EQ(file.path, L"bench") << "declined";
-    EXPECT_FALSE(progress.activities.contains(41));
-
     questions.answer = L"runs\\lap.mdf";
-    file.Say(L"a frame is damaged");
     dialog->OnCustomizePoint();
-    EXPECT_EQ(file.type, L"MDF");
     EXPECT_EQ(view.entries[2], L"File|MDF|runs\\lap.mdf");
     EXPECT_EQ(view.chosen, 2U);
-    EXPECT_EQ(router.GetActivePointName(0), L"File");
-    EXPECT_EQ(progress.activities[41].text, L"7004");
-    EXPECT_EQ(progress.activities[41].count, 1);
-    EXPECT_EQ(progress.activities[41].steps, 1);
-    EXPECT_FALSE(progress.activities[41].connected);
-    EXPECT_EQ(messages.stacks.size(), 1U);
     EXPECT_EQ(sheets.shown, 0);
 }
 

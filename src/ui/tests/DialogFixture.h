@@ -87,7 +87,7 @@ public:
 class DialogTest : public simtest::SimulationTest
 {
 protected:
-    DialogTest() : sheet(controller, {texts, &messageService, &sheets, &questions, &progress})
+    DialogTest() : sheet(controller, {texts, &messageService, &sheets, &questions})
     {
         userInterface.shownPanes[6247] = true;
         router.SelectPoint(L"Live");
