@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
+#include <dlfcn.h>
 #include <optional>
 #include <sstream>
 
@@ -10,6 +11,7 @@
 #include <osg/GLExtensions>
 #include <osg/GraphicsContext>
 #include <osg/Viewport>
+#include <osgDB/FileNameUtils>
 #include <osgDB/Registry>
 
 #include "base/AtomicFile.h"
@@ -72,6 +74,19 @@ void Paste(const osg::Image& picture, osg::Image& sheet, int left, int bottom)
         std::memcpy(sheet.data(left, bottom + y), picture.data(0, y), static_cast<std::size_t>(picture.s()) * 3);
 }
 
+/// Plug-ins are asked for as "osgPlugins-3.6.5/osgdb_png.so", and the library looks for that name below the working
+/// directory before it strips the folder: code of somebody else. Found at once, it looks no further.
+void LookForPluginsWhereTheLibraryIs()
+{
+    Dl_info info = {};
+    if (dladdr(reinterpret_cast<void*>(&osgDB::getLowerCaseFileExtension), &info) == 0 || !info.dli_fname)
+        return;
+    const std::string folder = std::filesystem::path(info.dli_fname).parent_path().string();
+    osgDB::FilePathList& folders = osgDB::Registry::instance()->getLibraryFilePathList();
+    if (folders.empty() || folders.front() != folder)
+        folders.push_front(folder);
+}
+
 } // namespace
 
 osg::ref_ptr<osg::Image> ReadPicture(osg::Camera& camera)
@@ -107,15 +122,21 @@ osg::ref_ptr<osg::Image> ReadPicture(osg::Camera& camera)
 
 std::string WritePicture(const osg::Image& picture, const std::filesystem::path& path)
 {
-    osgDB::ReaderWriter* writer = osgDB::Registry::instance()->getReaderWriterForExtension("png");
+    const std::string ending = osgDB::getLowerCaseFileExtension(path.string());
+    const char* format = ending == "jpg" || ending == "jpeg"   ? "jpeg"
+                         : ending == "tif" || ending == "tiff" ? "tiff"
+                                                               : "png";
+    LookForPluginsWhereTheLibraryIs();
+    osgDB::ReaderWriter* writer = osgDB::Registry::instance()->getReaderWriterForExtension(format);
     if (!writer)
-        return path.string() + ": the scene graph library has no PNG writer";
+        return path.string() + ": the scene graph library's plug-in for \"" + format + "\" is missing";
 
-    std::ostringstream png;
-    const osgDB::ReaderWriter::WriteResult result = writer->writeImage(picture, png);
+    const osg::ref_ptr<osgDB::Options> options = new osgDB::Options("JPEG_QUALITY 92");
+    std::ostringstream bytes;
+    const osgDB::ReaderWriter::WriteResult result = writer->writeImage(picture, bytes, options);
     if (!result.success())
-        return path.string() + ": the picture can't be written as PNG " + result.message();
-    return base::WriteWholeFile(path, png.view());
+        return path.string() + ": the picture can't be written as " + format + " " + result.message();
+    return base::WriteWholeFile(path, bytes.view());
 }
 
 osg::ref_ptr<osg::Image> ScalePicture(const osg::Image& picture, int width, int height)

@@ -19,7 +19,8 @@ namespace hosts
 /// viewport. Call it between two frames; the camera's context is current for the time of the call only.
 osg::ref_ptr<osg::Image> ReadPicture(osg::Camera& camera);
 
-/// Writes `picture` as a PNG file that appears whole or not at all. Empty on success, else the reason with the path.
+/// Writes `picture` as a file that appears whole or not at all: JPEG and TIFF by the ending of `path` (.jpg, .jpeg,
+/// .tif, .tiff), else PNG. Empty on success, else the reason with the path.
 std::string WritePicture(const osg::Image& picture, const std::filesystem::path& path);
 
 /// A picture and where its lower left corner lies in a larger one, in pixels.

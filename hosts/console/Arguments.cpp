@@ -67,8 +67,11 @@ std::string Relocated(const std::string& value, const PathOption& option, const 
     return value.substr(0, start) + folder.string() + "/" + value.substr(start);
 }
 
+std::vector<std::filesystem::path> readFiles;
+
 void AppendFile(const std::filesystem::path& path, std::vector<std::string>& arguments)
 {
+    readFiles.push_back(path);
     std::ifstream in(path);
     if (!in || std::filesystem::is_directory(path))
         throw ArgumentError(path.string() + ": the file of arguments can't be read");
@@ -173,6 +176,11 @@ std::vector<std::string> ExpandArgumentFiles(const std::vector<std::string>& arg
         else
             expanded.push_back(argument);
     return expanded;
+}
+
+const std::vector<std::filesystem::path>& ReadArgumentFiles()
+{
+    return readFiles;
 }
 
 } // namespace console

@@ -66,4 +66,7 @@ MovableArgument ParseMovable(const std::string& text);
 /// folder of FILE. An "@" within FILE has no meaning.
 std::vector<std::string> ExpandArgumentFiles(const std::vector<std::string>& arguments);
 
+/// The files that stood behind "@", since the start of the program.
+const std::vector<std::filesystem::path>& ReadArgumentFiles();
+
 } // namespace console

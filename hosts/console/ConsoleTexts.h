@@ -19,6 +19,7 @@ inline constexpr std::uint32_t messageFolderNotMade = 9122; ///< %1 folder and r
 inline constexpr std::uint32_t messageConversion = 9123;    ///< %1 file, place and reason
 inline constexpr std::uint32_t messageAlwaysHeadless = 9124;
 inline constexpr std::uint32_t messageInterrupted = 9125;
+inline constexpr std::uint32_t messageIsInput = 9126; ///< %1 the file
 inline constexpr std::uint32_t textPlaying = 9130;
 
 } // namespace console

@@ -4,6 +4,7 @@
 
 #include <fmt/format.h>
 
+#include "base/AtomicFile.h"
 #include "base/Text.h"
 #include "hosts/console/ConsoleHost.h"
 #include "hosts/console/ConsoleTexts.h"
@@ -36,8 +37,9 @@ int Convert(const ConversionFiles& files, Converter converter)
         host.ShowError(messageConversion, base::Utf8(report.error));
         return 1;
     }
-    std::cout << fmt::format("{}: {} frames, {} poses, {} instruments\n", files.to.string(), report.frames,
-                             report.poses, report.instruments);
+    if (!base::IsSpecialFile(files.to))
+        std::cout << fmt::format("{}: {} frames, {} poses, {} instruments\n", files.to.string(), report.frames,
+                                 report.poses, report.instruments);
     return 0;
 }
 

@@ -4,6 +4,7 @@
 
 #include "hosts/console/Command.h"
 #include "hosts/console/Conversion.h"
+#include "hosts/console/Outputs.h"
 
 namespace console
 {
@@ -16,7 +17,12 @@ void AddMdfExportCommand(CLI::App& mdf, int& status)
     command->add_option("-o,--output", files->to, "The table to write.")->type_name("DATA.csv")->required();
     command->footer("Example:\n"
                     "  panoramic mdf export run.mdf -o data.csv");
-    command->callback([files, &status] { status = Convert(*files, SimulationDataPoints::VtCMotionDataCsv::Export); });
+    command->callback(
+        [files, &status]
+        {
+            CheckOutput(files->to, Content::table, {files->from});
+            status = Convert(*files, SimulationDataPoints::VtCMotionDataCsv::Export);
+        });
 }
 
 } // namespace console

@@ -5,6 +5,7 @@
 
 #include "hosts/console/Command.h"
 #include "hosts/console/Conversion.h"
+#include "hosts/console/Outputs.h"
 
 namespace console
 {
@@ -20,7 +21,12 @@ void AddMdfImportCommand(CLI::App& mdf, int& status)
                     "an instrument stream, its unit in square brackets.\n\n"
                     "Example:\n"
                     "  panoramic mdf import data.csv -o run.mdf");
-    command->callback([files, &status] { status = Convert(*files, SimulationDataPoints::VtCMotionDataCsv::Import); });
+    command->callback(
+        [files, &status]
+        {
+            CheckOutput(files->to, Content::motionData, {files->from});
+            status = Convert(*files, SimulationDataPoints::VtCMotionDataCsv::Import);
+        });
 }
 
 } // namespace console

@@ -9,6 +9,7 @@
 #include "base/Text.h"
 #include "hosts/common/Picture.h"
 #include "hosts/console/ConsoleTexts.h"
+#include "hosts/console/Outputs.h"
 #include "hosts/console/Session.h"
 #include "simdata/SimulationDataController.h"
 
@@ -22,6 +23,7 @@ constexpr long activity = 9000;
 constexpr std::uint32_t progressInterval = 100; // milliseconds
 constexpr long progressSteps = 100;
 constexpr int sheetCell = 480; // pixels
+constexpr const char* sheetName = "contact-sheet.png";
 
 } // namespace
 
@@ -44,6 +46,12 @@ bool Playback::Prepare()
     for (const Shot& shot : arguments.shots)
         if (!CheckTime(session, shot.time, viewArguments.scene.data))
             return false;
+
+    std::vector<std::filesystem::path> outputs{arguments.folder / sheetName};
+    for (const Shot& shot : arguments.shots)
+        outputs.push_back(arguments.folder / (shot.name + ".png"));
+    if (!CheckAgainstModels(session, outputs))
+        return false;
 
     std::error_code failed;
     std::filesystem::create_directories(arguments.folder, failed);
@@ -176,7 +184,7 @@ void Playback::WriteContactSheet()
     const osg::ref_ptr<osg::Image> sheet = hosts::ComposeContactSheet(pictures, columns, sheetCell);
     if (!sheet)
         return;
-    const std::filesystem::path file = arguments.folder / "contact-sheet.png";
+    const std::filesystem::path file = arguments.folder / sheetName;
     if (const std::string reason = hosts::WritePicture(*sheet, file); !reason.empty())
         session.GetHost().ShowError(messagePictureNotWritten, reason);
     else

@@ -1,11 +1,11 @@
 #include <CLI/CLI.hpp>
 
-#include <iostream>
 #include <memory>
 
 #include "app/PanoramicDocument.h"
 #include "base/Paths.h"
 #include "hosts/console/Command.h"
+#include "hosts/console/Outputs.h"
 #include "hosts/console/Session.h"
 
 namespace console
@@ -25,9 +25,10 @@ int Run(const CopyArguments& arguments)
 {
     Session session(arguments.verbose);
     VtCPanoramicDocument* document = session.OpenDocument(std::filesystem::absolute(arguments.input));
-    if (!document || !document->OnSaveDocument(base::InnerPath(std::filesystem::absolute(arguments.output))))
+    if (!document || !CheckAgainstModels(session, {arguments.output}) ||
+        !document->OnSaveDocument(base::InnerPath(std::filesystem::absolute(arguments.output))))
         return Session::failed;
-    std::cout << arguments.output.string() << '\n';
+    TellWritten(arguments.output);
     return session.GetExitStatus();
 }
 
@@ -45,7 +46,12 @@ void AddSceneCopyCommand(CLI::App& scene, int& status)
         "records and attributes that nobody here knows are as they were. A second copy is the same file.\n\n"
         "Example:\n"
         "  panoramic scene copy old.xml -o new.xml");
-    command->callback([arguments, &status] { status = Run(*arguments); });
+    command->callback(
+        [arguments, &status]
+        {
+            CheckOutput(arguments->output, Content::scene, {arguments->input});
+            status = Run(*arguments);
+        });
 }
 
 } // namespace console

@@ -1,12 +1,12 @@
 #include <CLI/CLI.hpp>
 
-#include <iostream>
 #include <memory>
 
 #include "app/PanoramicDocument.h"
 #include "base/Paths.h"
 #include "hosts/console/Command.h"
 #include "hosts/console/ConsoleView.h"
+#include "hosts/console/Outputs.h"
 #include "hosts/console/Session.h"
 
 namespace console
@@ -29,9 +29,10 @@ int Run(const NewArguments& arguments)
         return Session::failed;
     if (arguments.view.place)
         PlaceFreeObserver(*document, *arguments.view.place);
-    if (!document->OnSaveDocument(base::InnerPath(std::filesystem::absolute(arguments.output))))
+    if (!CheckAgainstModels(session, {arguments.output}) ||
+        !document->OnSaveDocument(base::InnerPath(std::filesystem::absolute(arguments.output))))
         return Session::failed;
-    std::cout << arguments.output.string() << '\n';
+    TellWritten(arguments.output);
     return session.GetExitStatus();
 }
 
@@ -56,6 +57,7 @@ void AddSceneNewCommand(CLI::App& scene, int& status)
         [arguments, &status]
         {
             CheckViewArguments(arguments->view);
+            CheckOutput(arguments->output, Content::scene, InputsOf(arguments->view.scene));
             status = Run(*arguments);
         });
 }

@@ -1,6 +1,5 @@
 #include <CLI/CLI.hpp>
 
-#include <iostream>
 #include <memory>
 
 #include "app/PanoramicDocument.h"
@@ -9,6 +8,7 @@
 #include "hosts/console/Command.h"
 #include "hosts/console/ConsoleTexts.h"
 #include "hosts/console/ConsoleView.h"
+#include "hosts/console/Outputs.h"
 #include "hosts/console/Session.h"
 
 namespace console
@@ -39,7 +39,7 @@ int Run(const Snapshot& snapshot)
     Session session(snapshot.view.verbose);
     ConsoleView::Prepare(session.GetHost(), snapshot.view.size);
     VtCPanoramicDocument* document = OpenScene(session, snapshot.view.scene);
-    if (!document)
+    if (!document || !CheckAgainstModels(session, {snapshot.output}))
         return Session::failed;
     const std::unique_ptr<ConsoleView> view = ConsoleView::Create(session.GetHost(), *document, snapshot.view);
     if (!view || !GoToMoment(session, snapshot))
@@ -55,7 +55,7 @@ int Run(const Snapshot& snapshot)
     if (const std::string reason = hosts::WritePicture(*picture, snapshot.output); !reason.empty())
         session.GetHost().ShowError(messagePictureNotWritten, reason);
     else
-        std::cout << snapshot.output.string() << '\n';
+        TellWritten(snapshot.output);
     return session.GetExitStatus();
 }
 
@@ -71,6 +71,7 @@ void Check(Snapshot& snapshot)
             RejectArguments("--time: \"" + snapshot.timeText + "\" is not a number");
     }
     CheckViewArguments(snapshot.view);
+    CheckOutput(snapshot.output, Content::picture, InputsOf(snapshot.view.scene));
     if (snapshot.view.scene.file.empty() && !snapshot.view.place)
         RejectArguments("--eye and --look are required without --scene");
 }
@@ -88,7 +89,9 @@ void AddSnapshotCommand(CLI::App& program, int& status)
         ->type_name("N")
         ->check(CLI::PositiveNumber)
         ->excludes(time);
-    command->add_option("-o,--output", snapshot->output, "The picture to write.")->type_name("PICTURE.png")->required();
+    command->add_option("-o,--output", snapshot->output, "The picture to write: PNG, JPEG or TIFF by its ending.")
+        ->type_name("PICTURE.png")
+        ->required();
     command->footer(
         "Examples:\n"
         "  panoramic snapshot --scene scene.xml --data run.mdf --time 12.5 --observer Driver -o picture.png\n"

@@ -26,7 +26,8 @@ QStringList Filters(const std::wstring& filter)
 
 std::optional<std::wstring> FileQuestions::AskSaveFile(const host::FileQuestion& question)
 {
-    return Ask(question, true);
+    std::optional<std::wstring> path = Ask(question, true);
+    return path && refuses && refuses(*path, question.defaultExtension) ? std::nullopt : path;
 }
 
 std::optional<std::wstring> FileQuestions::AskOpenFile(const host::FileQuestion& question)

@@ -6,6 +6,8 @@
 
 #include "app/PanoramicApp.h"
 #include "app/PanoramicDocument.h"
+#include "assets/AssetManager.h"
+#include "base/AtomicFile.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/common/IniTexts.h"
@@ -22,6 +24,7 @@ namespace
 {
 
 constexpr std::uint32_t messageSceneNotReadable = 496; // %1 the file, %2 the reason
+constexpr std::uint32_t messageIsInput = 9126;         // %1 the file
 constexpr std::uint32_t textOtherSceneType = 9014;
 
 constexpr std::uint32_t textLoadingScene = 7002;
@@ -57,6 +60,8 @@ SceneFiles::SceneFiles(VtCPanoramicApp& application, DesktopHost& desktopHost, S
                        QWidget& parentWindow, std::function<void()> changedFiles)
     : app(application), host(desktopHost), state(stateFile), window(parentWindow), changed(std::move(changedFiles))
 {
+    host.GetFileQuestions().SetRefusal([this](const std::wstring& path, const std::wstring& extension)
+                                       { return RefuseInput(path, extension); });
 }
 
 bool SceneFiles::IsModified() const
@@ -189,6 +194,18 @@ bool SceneFiles::SaveAs()
     const auto path = host.GetQuestions()->AskSaveFile(
         {FromQt(Part(host.GetTexts(), textSaveAs, 1)), sceneFilter, L"xml", scenePath});
     return path && SaveTo(*path);
+}
+
+bool SceneFiles::RefuseInput(const std::wstring& path, const std::wstring& extension)
+{
+    const std::filesystem::path output = base::NativePath(path);
+    const auto isSame = [&](const std::wstring& input)
+    { return !input.empty() && base::IsSameFile(output, base::NativePath(input)); };
+    const bool isOwnScene = extension == L"xml" && isSame(scenePath);
+    if (isOwnScene || !(isSame(scenePath) || isSame(dataPath) || VtCOsgAssetManager::getInstance().hasRead(output)))
+        return false;
+    app.GetMessageHandler().ShowError(messageIsInput, FromQt(ShownPath(path)));
+    return true;
 }
 
 bool SceneFiles::SaveTo(const std::wstring& path)

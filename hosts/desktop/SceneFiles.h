@@ -55,6 +55,9 @@ private:
     bool OpenScene(const std::wstring& path);
     bool LoadData(const std::wstring& path);
     bool SaveTo(const std::wstring& path);
+
+    /// Whether what is loaded was read from this file, after a message. A scene may be saved to its own.
+    bool RefuseInput(const std::wstring& path, const std::wstring& extension);
     bool CanRead(const std::wstring& path);
     void Remember(const std::wstring& path);
 

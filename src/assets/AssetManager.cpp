@@ -1,5 +1,6 @@
 #include "assets/AssetManager.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -19,6 +20,7 @@
 #include "assets/ModelNormals.h"
 #include "assets/models/ModelReader.h"
 #include "assets/TextureCollector.h"
+#include "base/AtomicFile.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "host/LibraryPaths.h"
@@ -386,6 +388,12 @@ void VtCOsgAssetManager::createProgram(const std::wstring& name, const std::wstr
     program->addShader(vertexShader);
     program->addShader(fragmentShader);
     programs[name] = program;
+}
+
+bool VtCOsgAssetManager::hasRead(const std::filesystem::path& file) const
+{
+    const std::set<std::string>& all = reader->GetFiles();
+    return std::any_of(all.begin(), all.end(), [&](const std::string& one) { return base::IsSameFile(file, one); });
 }
 
 osg::Program* VtCOsgAssetManager::getProgram(const std::wstring& name) const

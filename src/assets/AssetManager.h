@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <filesystem>
 #include <map>
 #include <string>
 #include <vector>
@@ -82,6 +83,9 @@ public:
     void emptyCache() override;
 
     std::vector<std::wstring> collectTextureFiles(osg::Node& node) const override;
+
+    /// Whether a model was made from this file, by whatever link or name: a model, a texture or a description.
+    bool hasRead(const std::filesystem::path& file) const;
 
     /// Names of the attributes that hold a texture file.
     const std::vector<std::wstring>& getTextureAttributeNames() const { return textureAttributeNames; }

@@ -3,9 +3,13 @@
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
+#include <optional>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
+#include <utility>
+
+#include "base/Numbers.h"
 
 namespace base
 {
@@ -24,15 +28,91 @@ mode_t UsualRights()
     return 0666 & ~mask;
 }
 
+/// One of the open files of this process: "/proc/self/fd/1", where "/dev/stdout" leads to.
+bool IsStream(const std::filesystem::path& path)
+{
+    const std::string folder = path.parent_path().string();
+    return (folder == "/proc/self/fd" || folder == "/dev/fd") && ParseInteger(path.filename().string());
+}
+
+/// Where `path` leads to in the end, whether there is a file or not; nothing for links that lead in a circle.
+std::optional<std::filesystem::path> BehindLinks(std::filesystem::path path)
+{
+    constexpr int most = 40; // as many as the system follows
+    for (int i = 0; i < most; ++i)
+    {
+        std::error_code failed;
+        if (IsStream(path) || !std::filesystem::is_symlink(path, failed))
+            return path;
+        const std::filesystem::path next = std::filesystem::read_symlink(path, failed);
+        if (failed)
+            return path;
+        path = path.parent_path() / next; // an absolute one takes the place of the whole
+    }
+    return std::nullopt;
+}
+
 } // namespace
 
-AtomicFile::AtomicFile(std::filesystem::path target) : path(std::move(target))
+bool IsSpecialFile(const std::filesystem::path& path)
 {
-    std::string name = path.string() + std::string(temporaryMark) + "XXXXXX";
+    std::error_code failed;
+    const auto status = std::filesystem::status(path, failed);
+    const std::optional<std::filesystem::path> end = BehindLinks(path);
+    return (std::filesystem::exists(status) && !std::filesystem::is_regular_file(status) &&
+            !std::filesystem::is_directory(status)) ||
+           (end && IsStream(*end));
+}
+
+bool IsSameFile(const std::filesystem::path& a, const std::filesystem::path& b)
+{
+    std::error_code failed;
+    return std::filesystem::equivalent(a, b, failed) && !failed;
+}
+
+AtomicFile::AtomicFile(std::filesystem::path given) : path(std::move(given))
+{
+    const std::optional<std::filesystem::path> end = BehindLinks(path);
+    struct stat status = {};
+    const bool exists = ::stat(path.c_str(), &status) == 0;
+    if (!end)
+        Fail(std::strerror(ELOOP));
+    else if (exists && S_ISDIR(status.st_mode))
+        Fail("it is a folder");
+    else if ((exists && !S_ISREG(status.st_mode)) || IsStream(*end))
+        OpenSpecial(IsStream(*end) ? *end : path);
+    else if (exists && access(path.c_str(), W_OK) != 0)
+        FailBySystem();
+    else
+    {
+        target = *end;
+        OpenTemporary();
+        if (file >= 0 && exists) // by name it stays the file it was
+        {
+            [[maybe_unused]] const int kept = fchown(file, status.st_uid, status.st_gid);
+            fchmod(file, status.st_mode & 0777);
+        }
+    }
+}
+
+void AtomicFile::OpenSpecial(const std::filesystem::path& special)
+{
+    isSpecial = true;
+    const std::string name = special.filename().string();
+    // A stream of this process keeps its place and its manner, which opening it by name would not.
+    const auto number = IsStream(special) ? ParseInteger(name) : std::nullopt;
+    file = number ? dup(static_cast<int>(*number)) : open(special.c_str(), O_WRONLY | O_NOCTTY | O_CLOEXEC);
+    if (file < 0)
+        FailBySystem();
+}
+
+void AtomicFile::OpenTemporary()
+{
+    std::string name = target.string() + std::string(temporaryMark) + "XXXXXX";
     file = mkstemp(name.data());
     if (file < 0)
     {
-        Fail("");
+        FailBySystem();
         return;
     }
     temporary = name;
@@ -48,11 +128,16 @@ AtomicFile::~AtomicFile()
         unlink(temporary.c_str());
 }
 
-bool AtomicFile::Fail(const char* what)
+bool AtomicFile::Fail(const std::string& reason)
 {
     if (error.empty())
-        error = path.string() + ": " + what + std::strerror(errno);
+        error = path.string() + ": " + reason;
     return false;
+}
+
+bool AtomicFile::FailBySystem()
+{
+    return Fail(std::strerror(errno));
 }
 
 bool AtomicFile::Write(const void* data, std::size_t size)
@@ -60,13 +145,18 @@ bool AtomicFile::Write(const void* data, std::size_t size)
     if (!error.empty())
         return false;
     const char* rest = static_cast<const char*>(data);
+    if (isSpecial)
+    {
+        pending.append(rest, size);
+        return true;
+    }
     while (size > 0)
     {
         const ssize_t written = write(file, rest, size);
         if (written < 0 && errno == EINTR)
             continue;
         if (written < 0)
-            return Fail("");
+            return FailBySystem();
         rest += written;
         size -= static_cast<std::size_t>(written);
     }
@@ -77,29 +167,42 @@ bool AtomicFile::WriteAt(std::size_t offset, const void* data, std::size_t size)
 {
     if (!error.empty())
         return false;
+    if (isSpecial)
+    {
+        pending.replace(offset, size, static_cast<const char*>(data), size);
+        return true;
+    }
     if (lseek(file, static_cast<off_t>(offset), SEEK_SET) < 0)
-        return Fail("");
-    return Write(data, size) && (lseek(file, 0, SEEK_END) >= 0 || Fail(""));
+        return FailBySystem();
+    return Write(data, size) && (lseek(file, 0, SEEK_END) >= 0 || FailBySystem());
 }
 
 bool AtomicFile::Commit()
 {
     if (!error.empty())
         return false;
+    if (isSpecial)
+    {
+        isSpecial = false;
+        const bool written = Write(pending);
+        const int done = close(std::exchange(file, -1));
+        return written && (done == 0 || FailBySystem());
+    }
     if (fsync(file) != 0)
-        return Fail("");
-    if (rename(temporary.c_str(), path.c_str()) != 0) // still locked, so nobody takes it for abandoned
-        return Fail("");
+        return FailBySystem();
+    if (rename(temporary.c_str(), target.c_str()) != 0) // still locked, so nobody takes it for abandoned
+        return FailBySystem();
     temporary.clear();
     const int closed = close(file);
     file = -1;
-    return closed == 0 || Fail("");
+    return closed == 0 || FailBySystem();
 }
 
 void RemoveAbandoned(const std::filesystem::path& path)
 {
-    const std::string start = path.filename().string() + std::string(temporaryMark);
-    const std::filesystem::path folder = path.has_parent_path() ? path.parent_path() : ".";
+    const std::filesystem::path target = BehindLinks(path).value_or(path);
+    const std::string start = target.filename().string() + std::string(temporaryMark);
+    const std::filesystem::path folder = target.has_parent_path() ? target.parent_path() : ".";
     std::error_code failed;
     for (std::filesystem::directory_iterator at(folder, failed), end; !failed && at != end; at.increment(failed))
     {

@@ -13,6 +13,10 @@ namespace base
 /// What is written goes to a temporary file in the same folder; `Commit` flushes it to the disk and renames it. Without
 /// a commit (an error, an early return) the temporary file is removed and an older file of that name stays untouched.
 /// The first failure is kept and everything after it does nothing.
+///
+/// A link is followed: the file that it leads to is replaced, with the rights it had. What is no ordinary file (a
+/// device, a pipe, "/dev/stdout") can't be replaced; it gets the bytes at `Commit`. A folder is an error, and so is an
+/// older file that may not be written.
 class AtomicFile
 {
 public:
@@ -33,13 +37,25 @@ public:
     const std::string& Error() const { return error; }
 
 private:
-    bool Fail(const char* what);
+    bool Fail(const std::string& reason);
+    bool FailBySystem();
+    void OpenSpecial(const std::filesystem::path& target);
+    void OpenTemporary();
 
-    std::filesystem::path path;
+    std::filesystem::path path;   ///< as given, for messages
+    std::filesystem::path target; ///< behind all links
+    bool isSpecial = false;
+    std::string pending; ///< for a special file, which takes no corrections
     std::filesystem::path temporary;
     int file = -1;
     std::string error;
 };
+
+/// Whether `path` leads to something that can't be replaced by a file: a device, a pipe, a standard stream.
+bool IsSpecialFile(const std::filesystem::path& path);
+
+/// Whether both are one file, by whatever links and names; false when one of them isn't there.
+bool IsSameFile(const std::filesystem::path& a, const std::filesystem::path& b);
 
 /// Writes `content` as the whole of `path`. Empty on success, else the reason with the path.
 std::string WriteWholeFile(const std::filesystem::path& path, std::string_view content);

@@ -156,6 +156,82 @@ TEST_F(SnapshotCommand, APictureThatCannotBeWrittenLeavesNothing)
     EXPECT_EQ(full.status, 1);
 }
 
+// Content that was written under a wrong name, or over what the user still needs, is lost for good.
+TEST_F(SnapshotCommand, AnOutputCostsNothingThatWasThere)
+{
+    namespace fs = std::filesystem;
+    ASSERT_EQ(Run({"scene", "new", "-o", "scene.xml", "--static", "ground.dae"}).status, 0);
+    folder.Write("models/Imported.xml", "<a/>");
+    fs::copy_file(folder.path / "car.dae", folder.path / "models/car.dae");
+    fs::create_directories(folder.path / "folder.png");
+    fs::create_symlink("run.mdf", folder.path / "link.png");
+    fs::create_hard_link(folder.path / "scene.xml", folder.path / "hard.xml");
+    folder.Write("place.args", "--eye\n5,0,10\n--look\n5,0,0\n--size\n16x9\n");
+    folder.Write("old.png", "old");
+    fs::create_symlink("old.png", folder.path / "to_old.png");
+
+    struct Case
+    {
+        std::vector<std::string> arguments;
+        int status;
+        const char* word; ///< of the message, or the beginning of what is printed
+    };
+    const std::vector<std::string> moment{"snapshot", "@place.args", "--data", "run.mdf", "--frame", "1", "-o"};
+    const auto snapshot = [&](const char* output)
+    {
+        std::vector<std::string> all = moment;
+        all.emplace_back(output);
+        return all;
+    };
+    const Case refused[] = {
+        {snapshot("link.png"), 2, "run.mdf"},
+        {snapshot("folder.png"), 2, "folder"},
+        {snapshot("p.xml"), 2, ".png, .jpg or .tif"},
+        {snapshot("p.bmp"), 2, ".png, .jpg or .tif"},
+        {{"scene", "copy", "scene.xml", "-o", "scene.xml"}, 2, "scene.xml"},
+        {{"scene", "copy", "scene.xml", "-o", "hard.xml"}, 2, "scene.xml"},
+        {{"scene", "copy", "scene.xml", "-o", "p.png"}, 2, ".xml"},
+        {{"scene", "new", "@place.args", "-o", "place.args"}, 2, "place.args"},
+        {{"scene", "new", "--static", "models/car.dae", "-o", "models/Imported.xml"}, 1, "Imported.xml"},
+        {{"mdf", "export", "run.mdf", "-o", "run.mdf"}, 2, ".csv"},
+        {{"mdf", "export", "run.mdf", "-o", "car.dae"}, 2, ".csv"},
+    };
+    const auto contents = [&]
+    {
+        std::string all;
+        for (const char* file : {"run.mdf", "scene.xml", "place.args", "car.dae", "models/Imported.xml"})
+            all += TemporaryFolder::Read(folder.path / file) + "\n";
+        return all;
+    };
+    const std::string before = contents();
+    for (const Case& c : refused)
+    {
+        SCOPED_TRACE(c.arguments.back());
+        const Result result = Run(c.arguments);
+        EXPECT_EQ(result.status, c.status);
+        EXPECT_NE(result.error.find(c.word), std::string::npos) << result.error;
+        EXPECT_EQ(contents(), before);
+    }
+    const Case written[] = {
+        {snapshot("/dev/stdout"), 0, "\x89PNG"},
+        {snapshot("to_old.png"), 0, "to_old.png"},
+        {snapshot("p.jpg"), 0, "p.jpg"},
+        {snapshot("p.tif"), 0, "p.tif"},
+    };
+    for (const Case& c : written)
+    {
+        SCOPED_TRACE(c.arguments.back());
+        const Result result = Run(c.arguments);
+        EXPECT_EQ(result.status, c.status) << result.error;
+        EXPECT_TRUE(result.out.starts_with(c.word)) << result.out.substr(0, 100);
+    }
+    EXPECT_TRUE(fs::is_symlink(folder.path / "to_old.png"));
+    const std::pair<const char*, const char*> signatures[] = {
+        {"old.png", "\x89PNG"}, {"p.jpg", "\xFF\xD8\xFF"}, {"p.tif", "II*"}};
+    for (const auto& [file, signature] : signatures)
+        EXPECT_TRUE(TemporaryFolder::Read(folder.path / file).starts_with(signature)) << file;
+}
+
 TEST_F(SnapshotCommand, WithoutAGraphicsContextTheReasonIsTold)
 {
     // A loader that finds no vendor is what a machine without any driver has.

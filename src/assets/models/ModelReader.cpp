@@ -79,6 +79,9 @@ osgDB::ReaderWriter::ReadResult VtCModelReader::readNode(const std::string& path
             bytes = Run(request);
         const UnpackedModel model = UnpackModel(bytes);
         const ModelReport& report = model.report;
+        for (const FileStamp& file : report.files)
+            if (file.size >= 0)
+                files.insert(file.path);
         if (!report.error.empty())
             return ReadResult(report.error);
 

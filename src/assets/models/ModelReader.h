@@ -1,6 +1,7 @@
 #pragma once
 
 #include <map>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -38,6 +39,9 @@ public:
     /// Reads several models at once, for `readNode` to find them ready. What nobody then reads stays until the end.
     void Preload(const std::vector<std::string>& paths, const osgDB::Options* options);
 
+    /// All files that models were made from since the start.
+    const std::set<std::string>& GetFiles() const { return files; }
+
 private:
     /// The bytes of a package that still holds, from the read before or from the disk; empty without one.
     std::string FindFinished(const ModelRequest& request) const;
@@ -48,4 +52,5 @@ private:
     VtCModelCache cache;
     mutable std::map<std::string, std::string> preloaded; ///< key -> package
     mutable std::map<osg::Drawable*, std::string> shaderNodes;
+    mutable std::set<std::string> files;
 };
