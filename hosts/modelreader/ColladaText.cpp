@@ -197,6 +197,14 @@ void FillShading(pugi::xml_node shading, bool hasHighlight, const ModelRequest& 
             .text()
             .set(Colour(rgb[0] * *intensity, rgb[1] * *intensity, rgb[2] * *intensity).c_str());
     }
+    // By itself it counts for an opaque white, which the stock reader takes for one that is not there.
+    if (const pugi::xml_node transparency = shading.child("transparency");
+        transparency && !shading.child("transparent"))
+    {
+        pugi::xml_node transparent = shading.insert_child_before("transparent", transparency);
+        transparent.append_attribute("opaque").set_value("A_ONE");
+        transparent.append_child("color").text().set("1 1 1 1");
+    }
     if (!hasHighlight)
         return;
     if (const auto specularity = request.Number("useSpecularity"); specularity && !shading.child("specular"))

@@ -1,6 +1,7 @@
 #include "StateBuilder.h"
 
 #include <osg/AlphaFunc>
+#include <osg/BlendColor>
 #include <osg/BlendFunc>
 #include <osg/Material>
 #include <osg/TexEnv>
@@ -149,6 +150,9 @@ void StateBuilder::TakeBlending(osg::StateSet& target, const osg::StateSet* sour
     if (!function)
         function = new osg::BlendFunc(GL_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA);
     target.setAttributeAndModes(function);
+    // How much of a surface without a picture is seen: COLLADA's transparency becomes a colour for the whole surface.
+    if (auto colour = Copy<osg::BlendColor>(source ? source->getAttribute(osg::StateAttribute::BLENDCOLOR) : nullptr))
+        target.setAttributeAndModes(colour);
     target.setRenderingHint(osg::StateSet::TRANSPARENT_BIN);
     if (seenThrough) // leaves and fences: what is clear must not fill the depth buffer
         target.setAttributeAndModes(new osg::AlphaFunc(osg::AlphaFunc::GREATER, leastVisibleAlpha));

@@ -10,7 +10,7 @@
 #include "assets/models/FileStamp.h"
 
 /// Counts with whatever the reading process does; a finished model of another version is read again.
-inline constexpr std::uint32_t modelPackageVersion = 2;
+inline constexpr std::uint32_t modelPackageVersion = 3;
 
 /// What is known of one model that was read, beside its graph.
 struct ModelReport

@@ -1,6 +1,8 @@
+#include <algorithm>
 #include <fstream>
 #include <iterator>
 
+#include <osg/BlendColor>
 #include <osg/BlendFunc>
 #include <osg/Material>
 #include <osg/ProxyNode>
@@ -267,6 +269,66 @@ TEST_F(AssetsReader, FacesSeenFromBothSidesAndThroughStayThatWay)
         const bool blends = state.getMode(GL_BLEND) == osg::StateAttribute::ON;
         EXPECT_EQ(blends, placed.geode->getName() == "fence");
         EXPECT_EQ(state.getRenderingHint() == osg::StateSet::TRANSPARENT_BIN, blends);
+    }
+}
+
+TEST_F(AssetsReader, ASkinStandsAsItIsAndAHalfTransparentSurfaceIsSeenByHalf)
+{
+    // Callbacks of the skin's own classes came along, and ended the first picture.
+    std::string skin = Dae({{},
+                            {},
+                            "1",
+                            "Y_UP",
+                            "<node id=\"bone\" sid=\"bone\" type=\"JOINT\"/><node name=\"body\">"
+                            "<instance_controller url=\"#c\"><skeleton>#bone</skeleton></instance_controller></node>"});
+    const auto list =
+        [](const std::string& id, const char* array, const std::string& values, const char* stride, const char* type)
+    {
+        const std::string count = std::to_string(1 + std::count(values.begin(), values.end(), ' '));
+        return "<source id=\"" + id + "\"><" + array + " id=\"" + id + "a\" count=\"" + count + "\">" + values + "</" +
+               array + "><technique_common><accessor source=\"#" + id + "a\" count=\"1\" stride=\"" + stride +
+               "\"><param type=\"" + type + "\"/></accessor></technique_common></source>";
+    };
+    skin.insert(skin.find("<library_visual_scenes>"),
+                "<library_controllers><controller id=\"c\"><skin source=\"#square\">" +
+                    list("j", "Name_array", "bone", "1", "name") +
+                    list("b", "float_array", "1 0 0 0 0 1 0 0 0 0 1 0 0 0 0 1", "16", "float4x4") +
+                    list("w", "float_array", "1", "1", "float") +
+                    "<joints><input semantic=\"JOINT\" source=\"#j\"/><input semantic=\"INV_BIND_MATRIX\" "
+                    "source=\"#b\"/></joints><vertex_weights count=\"4\"><input semantic=\"JOINT\" source=\"#j\" "
+                    "offset=\"0\"/><input semantic=\"WEIGHT\" source=\"#w\" offset=\"1\"/><vcount>1 1 1 1</vcount>"
+                    "<v>0 0 0 0 0 0 0 0</v></vertex_weights></skin></controller></library_controllers>");
+    const auto body = Read(Write("skin.dae", skin));
+    ASSERT_TRUE(body) << error;
+    ASSERT_EQ(Geometries(*body).size(), 1u);
+    const osg::Geometry& shape = *Geometries(*body).at(0).geometry;
+    EXPECT_STREQ(shape.className(), "Geometry");
+    EXPECT_FALSE(shape.getUpdateCallback() || shape.getComputeBoundingBoxCallback());
+    ExpectBox(Geometries(*body).at(0).box, {0, 0, 0}, {1, 1, 0});
+
+    const char* const ways[] = {
+        "<transparent opaque=\"A_ONE\"><color>1 1 1 "
+        "1</color></transparent><transparency><float>0.5</float></transparency>",
+        "<transparent opaque=\"RGB_ZERO\"><color>0.5 0.5 0.5 0.5</color></transparent>"
+        "<transparency><float>1</float></transparency>",
+        "<transparency><float>0.5</float></transparency>",
+    };
+    for (const char* way : ways)
+    {
+        SCOPED_TRACE(way);
+        const auto pane = Read(Write("pane.dae", Dae({{{"a", "", "g"}},
+                                                      {{"g", std::string("<lambert><diffuse><color>1 0 0 1</color>"
+                                                                         "</diffuse>") +
+                                                                 way + "</lambert>"}},
+                                                      "1",
+                                                      "Y_UP",
+                                                      {}})));
+        ASSERT_TRUE(pane) << error;
+        const osg::StateSet& state = *Geometries(*pane).at(0).geometry->getStateSet();
+        EXPECT_EQ(state.getRenderingHint(), osg::StateSet::TRANSPARENT_BIN);
+        const auto* colour = dynamic_cast<const osg::BlendColor*>(state.getAttribute(osg::StateAttribute::BLENDCOLOR));
+        ASSERT_TRUE(colour);
+        EXPECT_NEAR(colour->getConstantColor().a(), 0.5, 0.01);
     }
 }
 
