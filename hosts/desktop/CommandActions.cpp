@@ -1,17 +1,17 @@
 #include "hosts/desktop/CommandActions.h"
 
-#include <algorithm>
-#include <iterator>
-
+#include <QAbstractButton>
+#include <QAbstractItemView>
+#include <QAbstractSpinBox>
 #include <QAction>
+#include <QApplication>
+#include <QComboBox>
+#include <QLineEdit>
+#include <QPlainTextEdit>
+#include <QTextEdit>
 
-#include "app/PanoramicApp.h"
-#include "host/CommandState.h"
-#include "host/Host.h"
 #include "hosts/desktop/Icons.h"
 #include "hosts/desktop/Wording.h"
-#include "render/ViewCommandsHandler.h"
-#include "simdata/ControllerCommands.h"
 
 namespace desktop
 {
@@ -19,102 +19,141 @@ namespace desktop
 namespace
 {
 
-struct CommandLook
+bool TakesKeys(const QWidget* widget)
 {
-    std::uint32_t command;
-    CommandActions::Look look;
-    bool checkable;
-};
+    return qobject_cast<const QLineEdit*>(widget) || qobject_cast<const QAbstractSpinBox*>(widget) ||
+           qobject_cast<const QTextEdit*>(widget) || qobject_cast<const QPlainTextEdit*>(widget) ||
+           qobject_cast<const QComboBox*>(widget) || qobject_cast<const QAbstractItemView*>(widget);
+}
 
-constexpr std::uint32_t textCustomize = 6903;
+QList<QKeySequence> KeysOf(const host::CommandLook& look, bool withBareKey)
+{
+    QList<QKeySequence> keys;
+    for (const char* key : {look.shortcut, withBareKey ? look.key : ""})
+        if (*key)
+            keys.append(QKeySequence(key));
+    return keys;
+}
 
-const CommandLook looks[] = {
-    {commandSingleView, {textSingleView, "layout-single", "Ctrl+1"}, false},
-    {commandTwoColumns, {textTwoColumns, "layout-columns", "Ctrl+2"}, false},
-    {commandTwoRows, {textTwoRows, "layout-rows", "Ctrl+3"}, false},
-    {commandFourViews, {textFourViews, "layout-four", "Ctrl+4"}, false},
-    {commandGouraud, {textGouraud, "mode-gouraud", "Alt+1"}, true},
-    {commandTextured, {textTextured, "mode-textured", "Alt+2"}, true},
-    {commandFlat, {textFlat, "mode-flat", "Alt+3"}, true},
-    {commandWireFrame, {textWireFrame, "mode-wire", "Alt+4"}, true},
-    {commandMixed, {textMixed, "mode-mixed", "Alt+5"}, true},
-    {commandStraighten, {textStraighten, "straighten", "Ctrl+T"}, false},
-    {ControllerCommand::start, {textStart, "controller/start", "F9"}, false},
-    {ControllerCommand::stop, {textStop, "controller/halt", "Shift+F9"}, false},
-    {ControllerCommand::firstFrame, {textFirstFrame, "controller/first", "Ctrl+Home"}, false},
-    {ControllerCommand::previousFrame, {textPreviousFrame, "controller/previous", "Ctrl+Left"}, false},
-    {ControllerCommand::stopPlay, {textStopPlay, "controller/stop", "F7"}, false},
-    {ControllerCommand::nextFrame, {textNextFrame, "controller/next", "Ctrl+Right"}, false},
-    {ControllerCommand::lastFrame, {textLastFrame, "controller/last", "Ctrl+End"}, false},
-    {ControllerCommand::playOnce, {textPlayOnce, "controller/play", "F5"}, true},
-    {ControllerCommand::playLoop, {textPlayLoop, "controller/loop", "F6"}, true},
-    {ControllerCommand::store, {textStore, "controller/store", nullptr}, false},
-    {ControllerCommand::refreshData, {textRefreshData, "controller/refresh", nullptr}, false},
-    {ControllerCommand::refreshChannels, {textRefreshChannels, "channels", nullptr}, false},
-    {ControllerCommand::noDataPoint, {textNoDataPoint, nullptr, nullptr}, true},
-    {ControllerCommand::customize, {textCustomize, "controller/customise", nullptr}, false},
-};
+QString NamesOf(const QList<QKeySequence>& keys)
+{
+    QStringList names;
+    for (const QKeySequence& key : keys)
+        names.append(key.toString(QKeySequence::NativeText));
+    return names.join(", ");
+}
 
 } // namespace
 
-CommandActions::CommandActions(VtCPanoramicApp& application, QObject& actionOwner, std::function<void()> executedAction)
-    : app(application), owner(actionOwner), texts(application.GetHost().GetTexts()), executed(std::move(executedAction))
+CommandActions::CommandActions(std::vector<host::CommandTarget*> commandTargets, const host::Texts& displayTexts,
+                               QWidget& actionWindow, std::function<void()> executed)
+    : texts(displayTexts), window(actionWindow), onExecuted(std::move(executed))
 {
+    for (host::CommandTarget* target : commandTargets)
+        for (const host::CommandLook& look : target->GetCommands())
+        {
+            order.push_back(look.number);
+            entries[look.number] = {look, target, Make(look)};
+        }
+    QObject::connect(qApp, &QApplication::focusChanged, &window,
+                     [this](QWidget*, const QWidget* now) { FollowFocus(now); });
 }
 
-QAction* CommandActions::Make(const QString& name, const Look& look)
+CommandActions::~CommandActions()
 {
-    auto* action = new QAction(Part(texts, look.text, 0), &owner);
-    action->setObjectName(name);
-    action->setStatusTip(Part(texts, look.text, 1));
-    if (look.icon)
-        action->setIcon(MakeIcon(look.icon));
-    QString tip = action->text().remove('&').remove("...");
-    if (look.shortcut)
-    {
-        action->setShortcut(QKeySequence(look.shortcut));
-        tip += " (" + action->shortcut().toString(QKeySequence::NativeText) + ")";
-    }
+    // The window's children go later, and tell of the focus then.
+    QObject::disconnect(qApp, &QApplication::focusChanged, &window, nullptr);
+}
+
+QAction* CommandActions::Make(const host::CommandLook& look)
+{
+    auto* action = new QAction(Part(texts, look.GetText(), 0), &window);
+    action->setObjectName(QString::number(look.number));
+    action->setStatusTip(Part(texts, look.GetText(), 1));
+    action->setIcon(MakeIcon(look.icon));
+    action->setCheckable(look.traits & host::hasCheck);
+    action->setShortcuts(KeysOf(look, true));
+    QString tip = Plain(action->text());
+    if (!action->shortcuts().isEmpty())
+        tip += " (" + NamesOf(action->shortcuts()) + ")";
     action->setToolTip(tip);
+    QObject::connect(action, &QAction::triggered, &window, [this, number = look.number] { Execute(number); });
+    window.addAction(action); // the keys work whether or not a menu has it
     return action;
 }
 
-QAction* CommandActions::Get(std::uint32_t command)
+void CommandActions::AddGroups(QWidget& bar, std::initializer_list<host::CommandGroup> groups,
+                               host::CommandTraits trait) const
 {
-    QAction*& action = commands[command];
-    if (action)
-        return action;
-    const auto* found = std::find_if(std::begin(looks), std::end(looks),
-                                     [command](const CommandLook& l) { return l.command == command; });
-    action =
-        found == std::end(looks) ? Make(QString::number(command), {}) : Make(QString::number(command), found->look);
-    action->setCheckable(found == std::end(looks) || found->checkable);
-    QObject::connect(action, &QAction::triggered, &owner, [this, command] { Execute(command); });
-    return action;
-}
-
-QAction* CommandActions::MakeOwn(const char* name, const Look& look, std::function<void()> carryOut)
-{
-    QAction* action = Make(name, look);
-    QObject::connect(action, &QAction::triggered, &owner, std::move(carryOut));
-    return action;
+    for (const host::CommandGroup group : groups)
+    {
+        bool first = true;
+        for (const std::uint32_t number : order)
+        {
+            const Entry& entry = entries.at(number);
+            if (entry.look.group != group || !(entry.look.traits & trait))
+                continue;
+            if (first && !bar.actions().isEmpty())
+            {
+                auto* line = new QAction(&bar);
+                line->setSeparator(true);
+                bar.addAction(line);
+            }
+            first = false;
+            bar.addAction(entry.action);
+        }
+    }
 }
 
 void CommandActions::Execute(std::uint32_t command)
 {
-    app.OnCmdMsg(command);
-    executed();
+    entries.at(command).target->OnCmdMsg(command);
+    onExecuted();
 }
 
-void CommandActions::Refresh()
+void CommandActions::Show(std::uint32_t command, const VtTCommandState& state) const
 {
-    for (const auto& [command, action] : commands)
-    {
-        const std::optional<VtTMenuState> state = app.GetMenuState(command);
-        action->setEnabled(state && state->enabled);
-        if (action->isCheckable())
-            action->setChecked(state && state->checked);
-    }
+    QAction& action = *Get(command);
+    action.setEnabled(state.enabled);
+    if (action.isCheckable())
+        action.setChecked(state.checked);
+    if (!state.text.empty())
+        action.setText(ToQt(state.text).replace('&', "&&"));
+}
+
+void CommandActions::Refresh() const
+{
+    for (const auto& [number, entry] : entries)
+        Show(number, entry.target->GetMenuState(number).value_or(VtTCommandState{}));
+}
+
+QString CommandActions::MakeHelp(std::initializer_list<host::CommandGroup> groups) const
+{
+    QString rows;
+    for (const host::CommandGroup group : groups)
+        for (const std::uint32_t number : order)
+        {
+            const host::CommandLook& look = entries.at(number).look;
+            const QString name = Plain(Part(texts, look.GetText(), 0));
+            if (look.group != group || name == QString::number(number)) // an entry of a list, named by what there is
+                continue;
+            rows += QString("<tr><td>%1</td><td><b>%2</b></td><td>%3</td></tr>")
+                        .arg(name.toHtmlEscaped(), NamesOf(KeysOf(look, true)).toHtmlEscaped(),
+                             Part(texts, look.GetText(), 1).toHtmlEscaped());
+        }
+    return rows;
+}
+
+void CommandActions::FollowFocus(const QWidget* focus) const
+{
+    const bool taken = TakesKeys(focus);
+    const bool onButton = qobject_cast<const QAbstractButton*>(focus) != nullptr;
+    for (const auto& [number, entry] : entries)
+        if (*entry.look.key)
+        {
+            const bool presses = onButton && QKeySequence(entry.look.key) == QKeySequence(Qt::Key_Space);
+            entry.action->setShortcuts(KeysOf(entry.look, !taken && !presses));
+        }
 }
 
 } // namespace desktop

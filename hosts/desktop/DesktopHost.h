@@ -14,13 +14,13 @@
 #include "hosts/common/IniTexts.h"
 #include "hosts/common/SelectionList.h"
 #include "hosts/common/SystemPaths.h"
-#include "hosts/desktop/controller/PropertySheets.h"
 #include "hosts/desktop/FileQuestions.h"
 #include "hosts/desktop/IdlePump.h"
 #include "hosts/desktop/MessageBoxes.h"
 #include "hosts/desktop/PaneGraphics.h"
 #include "hosts/desktop/PausedClock.h"
 #include "hosts/desktop/ProgressBox.h"
+#include "hosts/desktop/PropertySheets.h"
 
 namespace desktop
 {

@@ -1,16 +1,15 @@
 #pragma once
 
-#include "hosts/desktop/controller/ThemedIcon.h"
+#include <QIcon>
+#include <QString>
 
 namespace desktop
 {
 
-/// An icon of the program's resources by its name: "open", or "controller/play" of those that the controller's dock
-/// has too.
-inline QIcon MakeIcon(const QString& name)
-{
-    const auto slash = name.lastIndexOf('/') + 1;
-    return MakeThemedIcon(":/" + name.left(slash) + "icons/" + name.mid(slash) + ".svg");
-}
+/// An icon of the program by the name of its drawing: "open", "play". Null for a name without one.
+///
+/// Drawings have one colour: wherever the file says "currentColor" it takes the colour of button texts in the palette
+/// of the moment, so that it can be seen on light and on dark windows. Drawn anew for each size.
+QIcon MakeIcon(const QString& name);
 
 } // namespace desktop

@@ -1,17 +1,18 @@
 #include "hosts/desktop/MainWindow.h"
 
+#include <algorithm>
+#include <iterator>
+
 #include <QApplication>
 #include <QCloseEvent>
 #include <QDockWidget>
 #include <QDragEnterEvent>
 #include <QLabel>
-#include <QMenuBar>
+#include <QMenu>
 #include <QMimeData>
 #include <QPlainTextEdit>
 #include <QScreen>
 #include <QStatusBar>
-#include <QToolBar>
-#include <QToolButton>
 #include <QVBoxLayout>
 #include <QWindow>
 
@@ -19,14 +20,15 @@
 #include "app/PanoramicDocument.h"
 #include "base/Text.h"
 #include "hosts/common/IniTexts.h"
-#include "hosts/desktop/controller/ControllerDock.h"
+#include "hosts/desktop/ControllerDock.h"
 #include "hosts/desktop/Icons.h"
 #include "hosts/desktop/PaneMenu.h"
 #include "hosts/desktop/SettingsDialog.h"
+#include "hosts/desktop/ViewPane.h"
+#include "hosts/desktop/WindowCommands.h"
 #include "hosts/desktop/Wording.h"
 #include "render/ChildFrame.h"
 #include "render/PanoramicView.h"
-#include "render/ViewCommandsHandler.h"
 #include "scene/Scene3D.h"
 #include "simdata/SimulationDataController.h"
 #include "ui/SimulationDataControllerDialog.h"
@@ -45,12 +47,6 @@ constexpr int storeDelay = 1000;     // milliseconds that a window rests before 
 constexpr const char* windowSection = "Window";
 constexpr int placesVersion = 1; // of what the docks and bars are
 
-constexpr std::uint32_t separator = 0; // among commands
-
-const std::vector<std::uint32_t> viewCommands = {
-    commandSingleView, commandTwoColumns, commandTwoRows,   commandFourViews, separator, commandGouraud,
-    commandTextured,   commandFlat,       commandWireFrame, commandMixed,     separator, commandStraighten};
-
 QString LocalFile(const QMimeData* data)
 {
     for (const QUrl& url : data->urls())
@@ -65,7 +61,7 @@ MainWindow::MainWindow(DesktopHost& desktopHost, VtCPanoramicApp& application)
     : host(desktopHost),
       app(application),
       texts(desktopHost.GetTexts()),
-      actions(application, *this,
+      actions({&application, this}, texts, *this,
               [this]
               {
                   Refresh();
@@ -73,6 +69,7 @@ MainWindow::MainWindow(DesktopHost& desktopHost, VtCPanoramicApp& application)
               }),
       state(desktopHost.GetStateFile(), desktopHost.GetMessages()),
       files(application, desktopHost, state, *this, [this] { UpdateTitle(); }),
+      menus(*this, actions, texts, state, [this](const QString& file) { files.OpenFile(InnerPath(file)); }),
       sceneWindows(*this, [this](ViewArea* area) { Place(area); })
 {
     setObjectName("main");
@@ -108,10 +105,8 @@ MainWindow::~MainWindow()
 
 void MainWindow::Build()
 {
-    BuildOwnActions();
     BuildController();
-    BuildMenus();
-    BuildToolBars();
+    menus.Build();
     RestorePlaces();
     built = true;
 
@@ -135,90 +130,11 @@ void MainWindow::LetGo()
     controllerDock = nullptr;
 }
 
-void MainWindow::BuildOwnActions()
+std::vector<host::CommandLook> MainWindow::GetCommands() const
 {
-    newScene = actions.MakeOwn("new", {textNewScene, "new", "Ctrl+N"}, [this] { files.New(); });
-    openScene = actions.MakeOwn("open", {textOpenScene, "open", "Ctrl+O"}, [this] { files.Open(); });
-    openData = actions.MakeOwn("open-data", {textOpenData, "open-data", "Ctrl+D"}, [this] { files.OpenData(); });
-    save = actions.MakeOwn("save", {textSave, "save", "Ctrl+S"}, [this] { files.Save(); });
-    saveAs = actions.MakeOwn("save-as", {textSaveAs, "save-as", "Ctrl+Shift+S"}, [this] { files.SaveAs(); });
-    quit = actions.MakeOwn("quit", {textQuit, "quit", "Ctrl+Q"}, [this] { close(); });
-    settings = actions.MakeOwn("settings", {textSettings, "settings", "Ctrl+,"}, [this] { EditProgramSettings(); });
-}
-
-void MainWindow::AddCommands(QWidget& bar, const std::vector<std::uint32_t>& commands)
-{
-    for (const std::uint32_t command : commands)
-    {
-        QAction* action = command == separator ? new QAction(this) : actions.Get(command);
-        if (command == separator)
-            action->setSeparator(true);
-        bar.addAction(action);
-    }
-}
-
-void MainWindow::BuildMenus()
-{
-    QMenu* file = menuBar()->addMenu(Part(texts, textFileMenu, 0));
-    file->addAction(newScene);
-    file->addAction(openScene);
-    file->addAction(openData);
-    recentMenu = file->addMenu(MakeIcon("recent"), Part(texts, textRecent, 0));
-    connect(recentMenu, &QMenu::aboutToShow, this, [this] { FillRecentMenu(); });
-    file->addSeparator();
-    file->addAction(save);
-    file->addAction(saveAs);
-    file->addSeparator();
-    file->addAction(settings);
-    file->addSeparator();
-    file->addAction(quit);
-
-    viewMenu = menuBar()->addMenu(Part(texts, textViewMenu, 0));
-    AddCommands(*viewMenu, viewCommands);
-
-    using namespace ControllerCommand;
-    QMenu* simulation = menuBar()->addMenu(Part(texts, textSimulationMenu, 0));
-    sourceMenu = simulation->addMenu(MakeIcon("source"), Part(texts, textDataSource, 0));
-    connect(sourceMenu, &QMenu::aboutToShow, this, [this] { FillSourceMenu(); });
-    AddCommands(*simulation,
-                {customize, refreshChannels, separator, start, stop, separator, playOnce, playLoop, stopPlay, separator,
-                 firstFrame, previousFrame, nextFrame, lastFrame, separator, refreshData, store});
-}
-
-QToolBar* MainWindow::AddBar(const char* name, int title)
-{
-    QToolBar* bar = addToolBar(Part(texts, textToolBars, title));
-    bar->setObjectName(name);
-    return bar;
-}
-
-void MainWindow::BuildToolBars()
-{
-    using namespace ControllerCommand;
-    QToolBar* file = AddBar("files", 0);
-    file->addActions({newScene, openScene, openData, save});
-
-    QToolBar* views = AddBar("views", 1);
-    AddCommands(*views, viewCommands);
-
-    QToolBar* simulation = AddBar("simulation", 2);
-    auto* sourceButton = new QToolButton;
-    sourceButton->setObjectName("source");
-    sourceButton->setIcon(MakeIcon("source"));
-    sourceButton->setMenu(sourceMenu);
-    sourceButton->setPopupMode(QToolButton::InstantPopup);
-    sourceButton->setToolTip(Part(texts, textDataSource, 0).remove('&'));
-    sourceButton->setStatusTip(Part(texts, textDataSource, 1));
-    simulation->addWidget(sourceButton);
-    AddCommands(*simulation, {start, stop, separator, firstFrame, previousFrame, playOnce, playLoop, stopPlay,
-                              nextFrame, lastFrame});
-
-    viewMenu->addSeparator();
-    for (QToolBar* bar : {file, views, simulation})
-        viewMenu->addAction(bar->toggleViewAction());
-    viewMenu->addSeparator();
-    for (QDockWidget* dock : findChildren<QDockWidget*>())
-        viewMenu->addAction(dock->toggleViewAction());
+    std::vector<host::CommandLook> looks;
+    GetWindowCommands().AddTo(looks);
+    return looks;
 }
 
 void MainWindow::BuildLog()
@@ -251,7 +167,7 @@ void MainWindow::BuildController()
     VtCSimulationDataControllerDialog* dialog = app.GetControllerDialog();
     if (!dialog)
         return;
-    controllerDock = new ControllerDock(*dialog, texts, this);
+    controllerDock = new ControllerDock(*dialog, actions, texts, *this);
     addDockWidget(Qt::BottomDockWidgetArea, controllerDock);
     splitDockWidget(controllerDock, logDock, Qt::Horizontal);
 }
@@ -284,8 +200,15 @@ void MainWindow::StorePlaces()
 
 void MainWindow::Place(ViewArea* area)
 {
+    // With the panes of the last scene the focus would go to the next field there is, which would keep the keys.
+    setFocus();
     if (area)
+    {
         middle->layout()->addWidget(area);
+        for (int pane = 1; pane <= 4; ++pane)
+            area->GetPaneWindow(pane).setAccessibleName(
+                Part(texts, textViewName + static_cast<std::uint32_t>(pane) - 1, 0));
+    }
 }
 
 void MainWindow::SelectionChanged()
@@ -332,39 +255,6 @@ void MainWindow::UpdateTitle()
     Refresh();
 }
 
-void MainWindow::FillSourceMenu()
-{
-    using namespace ControllerCommand;
-    sourceMenu->clear();
-    sourceMenu->addAction(actions.Get(noDataPoint));
-    sourceMenu->addSeparator();
-    const std::vector<std::wstring> entries =
-        toolBarEvents ? toolBarEvents->OnDropDown(firstSelect) : std::vector<std::wstring>();
-    for (std::uint32_t i = 0; i < entries.size() && firstSelect + i <= lastSelect; ++i)
-    {
-        QAction* choice = actions.Get(firstSelect + i);
-        choice->setText(ToQt(entries[i]));
-        sourceMenu->addAction(choice);
-    }
-    actions.Refresh();
-}
-
-void MainWindow::FillRecentMenu()
-{
-    recentMenu->clear();
-    for (const std::string& path : state.GetRecentFiles())
-    {
-        const QString shown = QString::fromStdString(path);
-        connect(recentMenu->addAction(QString(shown).replace('&', "&&")), &QAction::triggered, this,
-                [this, shown] { files.OpenFile(InnerPath(shown)); });
-    }
-    const bool any = !recentMenu->isEmpty();
-    recentMenu->addSeparator();
-    QAction* clear = recentMenu->addAction(Part(texts, textRecent, 2));
-    clear->setEnabled(any);
-    connect(clear, &QAction::triggered, this, [this] { state.ClearRecentFiles(); });
-}
-
 void MainWindow::EditProgramSettings()
 {
     if (EditSettings(*this, app, state))
@@ -375,6 +265,58 @@ void MainWindow::FollowScreen()
 {
     const QScreen* shownOn = screen();
     host.GetPump().SetRefreshRate(IsPaced(state) && shownOn ? shownOn->refreshRate() : 0.0);
+}
+
+bool MainWindow::CanTogglePlay() const
+{
+    using namespace ControllerCommand;
+    const auto enabled = [this](std::uint32_t command) { return app.GetMenuState(command)->enabled; };
+    return app.GetControllerDialog() && (enabled(playOnce) || enabled(stopPlay) || enabled(firstFrame));
+}
+
+void MainWindow::TogglePlay()
+{
+    app.GetControllerDialog()->TogglePlay();
+}
+
+void MainWindow::MoveFocus(int step)
+{
+    std::vector<QWidget*> stops;
+    ViewArea* area = sceneWindows.GetArea();
+    for (int pane = 1; pane <= 4; ++pane)
+        if (area->GetPaneWindow(pane).isVisible())
+            stops.push_back(&area->GetPaneWindow(pane));
+    const std::ptrdiff_t shownPanes = std::ssize(stops);
+    for (QDockWidget* dock : {static_cast<QDockWidget*>(controllerDock), logDock})
+        if (dock && dock->isVisible())
+            for (QWidget* inside : dock->widget()->findChildren<QWidget*>() << dock->widget())
+                if (inside->isEnabled() && inside->isVisible() && (inside->focusPolicy() & Qt::TabFocus))
+                {
+                    stops.push_back(inside);
+                    break;
+                }
+    if (stops.empty())
+        return;
+
+    // Wherever in a dock the focus is, the dock is where it stands.
+    const auto holdsFocus = [this](const QWidget* stop)
+    {
+        for (const QWidget* widget = focusWidget(); widget; widget = widget->parentWidget())
+            if (widget == stop || (qobject_cast<const QDockWidget*>(widget) && widget->isAncestorOf(stop)))
+                return true;
+        return false;
+    };
+    const auto at = std::find_if(stops.begin(), stops.end(), holdsFocus);
+    const std::ptrdiff_t count = std::ssize(stops);
+    // From nowhere a step forward leads to the first, one back to the last.
+    const std::ptrdiff_t from = at != stops.end() ? at - stops.begin() : step > 0 ? -1 : count;
+    const std::ptrdiff_t to = (from + step + count) % count;
+    QWidget* next = stops[static_cast<std::size_t>(to)];
+    next->setFocus(Qt::ShortcutFocusReason);
+    if (to < shownPanes)
+        if (VtCPanoramicView* view = area->GetView(static_cast<ViewPane*>(next)->GetNumber()))
+            GetChildFrame()->activateView(*view);
+    Refresh();
 }
 
 std::int32_t MainWindow::GetWindowState() const

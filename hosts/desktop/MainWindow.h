@@ -9,18 +9,17 @@
 #include "host/Selection.h"
 #include "hosts/desktop/CommandActions.h"
 #include "hosts/desktop/DesktopHost.h"
+#include "hosts/desktop/Menus.h"
 #include "hosts/desktop/SceneFiles.h"
 #include "hosts/desktop/SceneWindows.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/ViewArea.h"
+#include "hosts/desktop/WindowCommands.h"
 #include "scene/SceneObjects.h"
 
 class QDockWidget;
 class QLabel;
-class QMenu;
 class QPlainTextEdit;
-class QToolBar;
-class QToolButton;
 class VtCPanoramicApp;
 
 namespace desktop
@@ -34,6 +33,7 @@ class ControllerDock;
 class MainWindow : public QMainWindow,
                    public WindowServices,
                    public ViewSurroundings,
+                   private host::CommandTarget,
                    private host::SelectionListener,
                    private VtISceneListener
 {
@@ -50,19 +50,28 @@ public:
 
     SceneFiles& GetFiles() { return files; }
     CommandActions& GetActions() { return actions; }
-    const CommandActions& GetActions() const { return actions; }
     const ViewArea* GetViewArea() const { return sceneWindows.GetArea(); }
 
     /// Of the object selected last; empty when nothing is.
     std::wstring GetSelectedId() const;
     std::wstring GetSelectedName() const;
 
+    // What its commands do
+
+    void EditProgramSettings();
+    bool CanTogglePlay() const;
+    void TogglePlay();
+    void ShowHelp() const { menus.ShowHelp(); }
+
+    /// On to the next pane or dock that shows, or back; a pane becomes the active one.
+    void MoveFocus(int step);
+
     std::int32_t GetWindowState() const override;
     void SetWindowState(std::int32_t state) override;
     void Hide() override { hide(); }
     void ShowMaximised() override { showMaximized(); }
     void AddMenuResource(std::uint32_t) override {} // the menus are the window's own
-    void SetToolBarEvents(host::ToolBarEvents* events) override { toolBarEvents = events; }
+    void SetToolBarEvents(host::ToolBarEvents* events) override { menus.SetToolBarEvents(events); }
     bool IsPaneShown(std::uint32_t pane) const override;
     void BeginWaitCursor() override;
     void EndWaitCursor() override;
@@ -82,10 +91,13 @@ protected:
     void showEvent(QShowEvent* event) override;
 
 private:
-    void BuildOwnActions();
-    void AddCommands(QWidget& bar, const std::vector<std::uint32_t>& commands);
-    void BuildMenus();
-    void BuildToolBars();
+    std::vector<host::CommandLook> GetCommands() const override;
+    std::optional<VtTCommandState> GetMenuState(std::uint32_t command) const override
+    {
+        return GetWindowCommands().GetState(*this, command);
+    }
+    bool OnCmdMsg(std::uint32_t command) override { return GetWindowCommands().Execute(*this, *this, command); }
+
     void BuildLog();
     void BuildController();
     void BuildStatusLine();
@@ -99,11 +111,7 @@ private:
     void ActiveViewChanged(VtCBase3DView* view, VtCGlidePanelAbstractNavigatorObject* observer) override;
     void Refresh();
     void UpdateTitle();
-    void FillSourceMenu();
-    void FillRecentMenu();
-    void EditProgramSettings();
     void FollowScreen();
-    QToolBar* AddBar(const char* name, int title);
 
     DesktopHost& host;
     VtCPanoramicApp& app;
@@ -111,20 +119,10 @@ private:
     CommandActions actions;
     StateFile state;
     SceneFiles files;
+    Menus menus;
     SceneWindows sceneWindows;
-    host::ToolBarEvents* toolBarEvents = nullptr;
 
     QWidget* middle = nullptr;
-    QAction* newScene = nullptr;
-    QAction* openScene = nullptr;
-    QAction* openData = nullptr;
-    QAction* save = nullptr;
-    QAction* saveAs = nullptr;
-    QAction* quit = nullptr;
-    QAction* settings = nullptr;
-    QMenu* sourceMenu = nullptr;
-    QMenu* recentMenu = nullptr;
-    QMenu* viewMenu = nullptr;
     QDockWidget* logDock = nullptr;
     ControllerDock* controllerDock = nullptr;
     QPlainTextEdit* log = nullptr;

@@ -10,7 +10,6 @@
 #include "interaction/Observers.h"
 #include "render/ChildFrame.h"
 #include "render/PanoramicView.h"
-#include "render/ViewCommandsHandler.h"
 #include "scene/ObjectHandle.h"
 
 namespace desktop
@@ -41,14 +40,8 @@ QMenu* MakePaneMenu(QWidget& parent, VtCPanoramicDocument& document, VtCPanorami
                                  document.SetModified(true);
                          });
     }
-    menu->addSeparator();
-    menu->addAction(actions.Get(commandStraighten));
-    menu->addSeparator();
-    for (const std::uint32_t command : {commandSingleView, commandTwoColumns, commandTwoRows, commandFourViews})
-        menu->addAction(actions.Get(command));
-    QMenu* modes = menu->addMenu(Part(texts, textRenderMode, 0));
-    for (const std::uint32_t command : {commandGouraud, commandTextured, commandFlat, commandWireFrame, commandMixed})
-        modes->addAction(actions.Get(command));
+    actions.AddGroups(*menu, {host::CommandGroup::camera, host::CommandGroup::layout}, host::inMenu);
+    actions.AddGroups(*menu->addMenu(Part(texts, textRenderMode, 0)), {host::CommandGroup::renderMode}, host::inMenu);
     return menu;
 }
 

@@ -13,6 +13,7 @@
 #include "hosts/common/IniTexts.h"
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/StateFile.h"
+#include "hosts/desktop/WindowCommands.h"
 #include "hosts/desktop/Wording.h"
 #include "records/SceneObjectStore.h"
 #include "simdata/SimulationDataController.h"
@@ -89,13 +90,13 @@ void SceneFiles::New()
 void SceneFiles::Open()
 {
     if (const auto path = host.GetQuestions()->AskOpenFile(
-            {FromQt(Part(host.GetTexts(), textOpenScene, 1)), sceneFilter, L"xml", scenePath}))
+            {FromQt(Part(host.GetTexts(), commandOpenScene, 1)), sceneFilter, L"xml", scenePath}))
         OpenScene(*path);
 }
 
 void SceneFiles::OpenData()
 {
-    if (const auto path = host.GetQuestions()->AskOpenFile({FromQt(Part(host.GetTexts(), textOpenData, 1)),
+    if (const auto path = host.GetQuestions()->AskOpenFile({FromQt(Part(host.GetTexts(), commandOpenData, 1)),
                                                             host.GetTexts().GetText(textDataFilter), L"mdf", dataPath}))
         LoadData(*path);
 }
@@ -192,7 +193,7 @@ bool SceneFiles::Save()
 bool SceneFiles::SaveAs()
 {
     const auto path = host.GetQuestions()->AskSaveFile(
-        {FromQt(Part(host.GetTexts(), textSaveAs, 1)), sceneFilter, L"xml", scenePath});
+        {FromQt(Part(host.GetTexts(), commandSaveAs, 1)), sceneFilter, L"xml", scenePath});
     return path && SaveTo(*path);
 }
 

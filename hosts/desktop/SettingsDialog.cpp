@@ -15,6 +15,7 @@
 #include "app/PanoramicApp.h"
 #include "host/Host.h"
 #include "hosts/desktop/StateFile.h"
+#include "hosts/desktop/WindowCommands.h"
 #include "hosts/desktop/Wording.h"
 
 namespace desktop
@@ -53,7 +54,7 @@ bool EditSettings(QWidget& parent, VtCPanoramicApp& app, StateFile& state)
 
     QDialog dialog(&parent);
     dialog.setObjectName("settings");
-    dialog.setWindowTitle(Part(texts, textSettings, 0).remove('&').remove("..."));
+    dialog.setWindowTitle(Plain(Part(texts, commandSettings, 0)));
     auto* form = new QFormLayout(&dialog);
 
     auto* slider = new QSlider(Qt::Horizontal);

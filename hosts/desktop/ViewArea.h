@@ -43,7 +43,7 @@ public:
     /// Null while there are no views.
     VtCSplitterEx* GetSplitterEx() const;
     VtCPanoramicView* GetView(int pane) const;
-    const ViewPane& GetPaneWindow(int pane) const { return *panes[static_cast<std::size_t>(pane - 1)]; }
+    ViewPane& GetPaneWindow(int pane) const { return *panes[static_cast<std::size_t>(pane - 1)]; }
 
     void SetFlying(bool flag) { surroundings.SetFlying(flag); }
     void ShowMenu(int pane, const QPoint& position);

@@ -34,4 +34,9 @@ QString Part(const host::Texts& texts, std::uint32_t number, int index)
                                                                         : QString();
 }
 
+QString Plain(QString label)
+{
+    return label.remove('&').remove("...");
+}
+
 } // namespace desktop

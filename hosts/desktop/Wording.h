@@ -10,48 +10,24 @@ namespace host
 class Texts;
 }
 
-/// Texts of the desktop program by their number, and text on its way to the toolkit and back.
+/// Texts of the desktop program by their number, and text on its way to the toolkit and back. Those of commands have
+/// the number of the command.
 namespace desktop
 {
 
 enum WordingNumber : std::uint32_t
 {
     textApplication = 101,
+    textSimulationDock = 6247,
+    textFrame = 6279,
+    textTime = 6280,
     textFileMenu = 9131,
     textViewMenu = 9132,
     textSimulationMenu = 9133,
-    textNewScene = 9134,
-    textOpenScene = 9135,
-    textOpenData = 9136,
     textRecent = 9137, ///< the sub-menu, and its last entry
-    textSave = 9138,
-    textSaveAs = 9139,
-    textQuit = 9140,
-    textSingleView = 9141,
-    textTwoColumns = 9142,
-    textTwoRows = 9143,
-    textFourViews = 9144,
-    textGouraud = 9145,
-    textTextured = 9146,
-    textFlat = 9147,
-    textWireFrame = 9148,
-    textMixed = 9149,
-    textStraighten = 9150,
-    textStart = 9151,
-    textStop = 9152,
-    textFirstFrame = 9153,
-    textPreviousFrame = 9154,
-    textStopPlay = 9155,
-    textNextFrame = 9156,
-    textLastFrame = 9157,
-    textPlayOnce = 9158,
-    textPlayLoop = 9159,
-    textStore = 9160,
-    textRefreshData = 9161,
-    textRefreshChannels = 9162,
-    textNoDataPoint = 9163,
-    textDataSource = 9164,
-    textSettings = 9165,
+    textHelpMenu = 9141,
+    textPaneKeys = 9142, ///< a heading, and the keys that work in a pane
+    textDataPoint = 9164,
     textObserver = 9166,
     textLog = 9167,         ///< the dock, and what its menu has
     textToolBars = 9168,    ///< one name for each
@@ -66,6 +42,10 @@ enum WordingNumber : std::uint32_t
     textReplacement = 9177,  ///< %1 the body, %2 the observers
     textSeverities = 9178,   ///< information, warning, error, log
     textMoreMessages = 9179, ///< %1 their number
+    textPosition = 9185,
+    textCount = 9186,    ///< %1 frames
+    textSeconds = 9187,  ///< %1 seconds
+    textViewName = 9010, ///< of pane 1, the others following
 };
 
 QString ToQt(const std::wstring& text);
@@ -79,5 +59,8 @@ QString ShownPath(const std::wstring& path);
 
 /// Part `index` of a text whose parts are separated by "|"; empty beyond the last.
 QString Part(const host::Texts& texts, std::uint32_t number, int index);
+
+/// The label of a menu as a name: without the mark of its key, and without the dots that announce a dialog.
+QString Plain(QString label);
 
 } // namespace desktop

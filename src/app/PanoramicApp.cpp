@@ -314,21 +314,35 @@ VtCBase3DView* VtCPanoramicApp::GetActiveView() const
     return frame ? frame->GetActiveView() : nullptr;
 }
 
+std::vector<host::CommandLook> VtCPanoramicApp::GetCommands() const
+{
+    std::vector<host::CommandLook> looks;
+    VtCVisualizationViewCommandsHandler::GetCommands().AddTo(looks);
+    VtCSimulationDataController::GetCommands().AddTo(looks);
+    return looks;
+}
+
+std::optional<VtTCommandState> VtCPanoramicApp::GetMenuState(std::uint32_t command) const
+{
+    const VtCPanoramicDocument* document = GetActiveDocument();
+    if (document && document->GetChildFrame())
+        if (std::optional<VtTCommandState> state = document->GetChildFrame()->getCommands().GetState(command))
+            return state;
+    return controller ? controller->GetMenuState(command) : std::nullopt;
+}
+
 bool VtCPanoramicApp::OnCmdMsg(std::uint32_t command)
 {
     const VtCPanoramicDocument* document = GetActiveDocument();
     if (document && document->GetChildFrame() && document->GetChildFrame()->getCommands().Execute(command))
         return true;
-    return controller && controller->OnCmdMsg(command);
-}
-
-std::optional<VtTMenuState> VtCPanoramicApp::GetMenuState(std::uint32_t command) const
-{
-    const VtCPanoramicDocument* document = GetActiveDocument();
-    VtTMenuState state;
-    if (document && document->GetChildFrame() && document->GetChildFrame()->getCommands().GetState(command, state))
-        return state;
-    return controller ? controller->GetMenuState(command) : std::nullopt;
+    if (!controller || !controller->GetMenuState(command))
+        return false;
+    if (controllerDialog)
+        controllerDialog->OnCommand(command);
+    else
+        controller->OnCmdMsg(command);
+    return true;
 }
 
 VtIInstrumentFeed* VtCPanoramicApp::GetActiveInstruments() const

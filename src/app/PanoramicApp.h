@@ -9,6 +9,7 @@
 #include "app/FrameCycle.h"
 #include "app/PanoramicMessageHandler.h"
 #include "app/VisualizationPPGSettings.h"
+#include "host/Commands.h"
 #include "simdata/SimulationServices.h"
 
 namespace host
@@ -30,7 +31,6 @@ class VtCSimulationDataController;
 class VtCSimulationDataControllerDialog;
 class VtCSimulationDataCustomizeSheet;
 class VtISceneListener;
-struct VtTMenuState;
 struct VtTSceneServices;
 
 /// The application object: what the host drives, and what everything outermost reaches the others by.
@@ -39,7 +39,10 @@ struct VtTSceneServices;
 /// here, on the thread that owns its windows, and raises idle events in between. Documents come and go after
 /// `FinalizeInitialization` and are closed before `StartShutdown`. A call of the host that fails throws
 /// `host::InterfaceError` through here; the host catches and shows it.
-class VtCPanoramicApp : public VtIActiveScene, private VtIFrameWork, private VtISettingsEffects
+class VtCPanoramicApp : public VtIActiveScene,
+                        public host::CommandTarget,
+                        private VtIFrameWork,
+                        private VtISettingsEffects
 {
 public:
     /// `programAround` outlives this.
@@ -89,14 +92,14 @@ public:
     /// Prepares the scene of the active view for a frame: its observers go where their bodies are now.
     void RenderCurrentView() override;
 
-    // Commands, by the numbers of menus and tool bars
+    // Commands: the views' of the active document, then the controller's. Without a scene those of the views have no
+    // state.
 
-    /// Carries the command out if it is enabled: the views' of the active document, then the controller's. False for a
-    /// number that is neither's.
-    bool OnCmdMsg(std::uint32_t command);
+    std::vector<host::CommandLook> GetCommands() const override;
+    std::optional<VtTCommandState> GetMenuState(std::uint32_t command) const override;
 
-    /// How the command shows; nothing for a number that is neither's.
-    std::optional<VtTMenuState> GetMenuState(std::uint32_t command) const;
+    /// A frame number that was typed into the controller's dialog counts before its commands.
+    bool OnCmdMsg(std::uint32_t command) override;
 
     // What others ask for
 

@@ -53,6 +53,7 @@ public:
     /// What the layout commands do: the layout, an active view that can be seen, an empty frame for cards that want
     /// one. 0 lets the active pane fill the frame.
     virtual void ApplyLayout(std::int32_t layout) = 0;
+    virtual std::int32_t GetLayout() const = 0;
 };
 
 /// Everything about a view of the scene except its window: camera, viewport, projection, observer.

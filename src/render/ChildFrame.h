@@ -82,6 +82,7 @@ public:
     void ObserverAssigned(const VtCBase3DView& view) override;
     void SelectBody(const VtC3DBody& body) override;
     void ApplyLayout(std::int32_t layout) override;
+    std::int32_t GetLayout() const override { return splitter->getLayout(); }
 
     // Stored records (`RegisterViewRecords`).
 

@@ -1,84 +1,78 @@
 #include "render/ViewCommandsHandler.h"
 
-#include <optional>
-
 #include "render/Base3DView.h"
 #include "render/SplitterEx.h"
 #include "scene/Scene3D.h"
 #include "scene/SceneServices.h"
-
-namespace
-{
-
-std::optional<std::int32_t> LayoutOf(std::uint32_t command)
-{
-    switch (command)
-    {
-    case commandSingleView:
-        return layoutSingle;
-    case commandTwoColumns:
-        return layoutTwoColumns;
-    case commandTwoRows:
-        return layoutTwoRows;
-    case commandFourViews:
-        return layoutFour;
-    default:
-        return std::nullopt;
-    }
-}
-
-std::optional<VtERenderMode> RenderModeOf(std::uint32_t command)
-{
-    switch (command)
-    {
-    case commandGouraud:
-        return VtERenderMode::Gouraud;
-    case commandTextured:
-        return VtERenderMode::Textured;
-    case commandFlat:
-        return VtERenderMode::Flat;
-    case commandWireFrame:
-        return VtERenderMode::WireFrame;
-    case commandMixed:
-        return VtERenderMode::Mixed;
-    default:
-        return std::nullopt;
-    }
-}
-
-} // namespace
 
 VtCScene3D* VtCVisualizationViewCommandsHandler::Scene() const
 {
     return frame.GetDocument().GetScene();
 }
 
-bool VtCVisualizationViewCommandsHandler::GetState(std::uint32_t command, VtTCommandState& state) const
+const host::CommandTable<VtCVisualizationViewCommandsHandler>& VtCVisualizationViewCommandsHandler::GetCommands()
 {
-    if (LayoutOf(command) || command == commandStraighten)
-        state = {true, false};
-    else if (const std::optional<VtERenderMode> mode = RenderModeOf(command))
-        state = {Scene() != nullptr, Scene() && Scene()->GetGlobalRenderMode() == *mode};
-    else if (command == commandFileClose || command == commandFileSave || command == commandFileSaveAs)
-        state = {false, false}; // the host's own file menu serves a scene
-    else
-        return false;
-    return true;
-}
+    using Views = VtCVisualizationViewCommandsHandler;
+    using enum host::CommandGroup;
+    constexpr unsigned both = host::inMenu | host::onToolBar;
+    constexpr unsigned check = host::hasCheck;
 
-bool VtCVisualizationViewCommandsHandler::Execute(std::uint32_t command)
-{
-    VtTCommandState state;
-    if (!GetState(command, state))
-        return false;
-    if (!state.enabled)
-        return true;
+    const auto layoutState = [](const Views& views, int which) -> VtTCommandState {
+        return {true, views.frame.GetLayout() == which};
+    };
+    const auto setLayout = [](Views& views, int which) { views.frame.ApplyLayout(which); };
 
-    if (const std::optional<std::int32_t> layout = LayoutOf(command))
-        frame.ApplyLayout(*layout);
-    else if (const std::optional<VtERenderMode> mode = RenderModeOf(command))
-        Scene()->ChangeGlobalRenderMode(*mode, *mode == VtERenderMode::Mixed);
-    else if (command == commandStraighten && frame.GetActiveView())
-        frame.GetActiveView()->straightenCamera();
-    return true;
+    const auto modeState = [](const Views& views, int mode) -> VtTCommandState
+    {
+        const VtCScene3D* scene = views.Scene();
+        return {scene != nullptr, scene && scene->GetGlobalRenderMode() == static_cast<VtERenderMode>(mode)};
+    };
+    const auto setMode = [](Views& views, int number)
+    {
+        const auto mode = static_cast<VtERenderMode>(number);
+        views.Scene()->ChangeGlobalRenderMode(mode, mode == VtERenderMode::Mixed);
+    };
+    const auto mode = [](VtERenderMode which) { return static_cast<int>(which); };
+
+    // A scene is served by the file menu of the program around.
+    const auto never = [](const Views&, int) { return VtTCommandState{}; };
+    const auto nothing = [](Views&, int) {};
+
+    static const host::CommandTable<Views> table{
+        // number, group, where, icon, shortcut | state | what it does | which
+        {{commandSingleView, layout, both | check, "layout-single", "Ctrl+1"}, layoutState, setLayout, layoutSingle},
+        {{commandTwoColumns, layout, both | check, "layout-columns", "Ctrl+2"},
+         layoutState,
+         setLayout,
+         layoutTwoColumns},
+        {{commandTwoRows, layout, both | check, "layout-rows", "Ctrl+3"}, layoutState, setLayout, layoutTwoRows},
+        {{commandFourViews, layout, both | check, "layout-four", "Ctrl+4"}, layoutState, setLayout, layoutFour},
+
+        {{commandGouraud, renderMode, both | check, "mode-gouraud", "Alt+1"},
+         modeState,
+         setMode,
+         mode(VtERenderMode::Gouraud)},
+        {{commandTextured, renderMode, both | check, "mode-textured", "Alt+2"},
+         modeState,
+         setMode,
+         mode(VtERenderMode::Textured)},
+        {{commandFlat, renderMode, both | check, "mode-flat", "Alt+3"}, modeState, setMode, mode(VtERenderMode::Flat)},
+        {{commandWireFrame, renderMode, both | check, "mode-wire", "Alt+4"},
+         modeState,
+         setMode,
+         mode(VtERenderMode::WireFrame)},
+        {{commandMixed, renderMode, both | check, "mode-mixed", "Alt+5"},
+         modeState,
+         setMode,
+         mode(VtERenderMode::Mixed)},
+
+        {{commandStraighten, camera, both, "straighten", "Ctrl+T"},
+         [](const Views& views, int) { return VtTCommandState{views.frame.GetActiveView() != nullptr}; },
+         [](Views& views, int) { views.frame.GetActiveView()->straightenCamera(); }},
+
+        {{commandFileClose}, never, nothing},
+        {{commandFileSave}, never, nothing},
+        {{commandFileSaveAs}, never, nothing},
+    };
+    return table;
 }

@@ -2,7 +2,7 @@
 
 #include <cstdint>
 
-#include "host/CommandState.h"
+#include "host/Commands.h"
 
 class VtCScene3D;
 class VtIViewFrame;
@@ -31,11 +31,16 @@ class VtCVisualizationViewCommandsHandler
 public:
     explicit VtCVisualizationViewCommandsHandler(VtIViewFrame& viewFrame) : frame(viewFrame) {}
 
-    /// True for a command of the views, enabled or not; a disabled one does nothing.
-    bool Execute(std::uint32_t command);
+    static const host::CommandTable<VtCVisualizationViewCommandsHandler>& GetCommands();
 
-    /// False for a number that isn't a command of the views; `state` then stays.
-    bool GetState(std::uint32_t command, VtTCommandState& state) const;
+    /// True for a command of the views, enabled or not; a disabled one does nothing.
+    bool Execute(std::uint32_t command) { return GetCommands().Execute(*this, *this, command); }
+
+    /// Nothing for a number that isn't a command of the views.
+    std::optional<VtTCommandState> GetState(std::uint32_t command) const
+    {
+        return GetCommands().GetState(*this, command);
+    }
 
 private:
     VtCScene3D* Scene() const;

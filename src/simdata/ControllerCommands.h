@@ -1,8 +1,11 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 
-#include "host/CommandState.h"
+#include "host/Commands.h"
+
+class VtCSimulationDataController;
 
 /// Command numbers of the menus and tool bars that the simulation data controller answers.
 namespace ControllerCommand
@@ -28,5 +31,15 @@ inline constexpr std::uint32_t playLoop = 38750;
 inline constexpr std::uint32_t playOnce = 38751;
 inline constexpr std::uint32_t spoolBack = 38752;
 inline constexpr std::uint32_t spoolForward = 38753;
-inline constexpr std::uint32_t videoConfiguration = 38900;
+inline constexpr std::uint32_t videoConfiguration = 38900; ///< a control
 } // namespace ControllerCommand
+
+/// What the state of a controller's command is read from: the frames of one data point, the active one with an empty
+/// name.
+struct VtTPointFrames
+{
+    const VtCSimulationDataController& controller;
+    const std::wstring& point;
+};
+
+using VtCControllerCommandTable = host::CommandTable<VtCSimulationDataController, VtTPointFrames>;

@@ -26,6 +26,7 @@ public:
     VtCSimulationDataController& operator=(const VtCSimulationDataController&) = delete;
 
     VtCSimulationDataRouter& GetRouter() { return router; }
+    const VtCSimulationDataRouter& GetRouter() const { return router; }
 
     // Simulation
 
@@ -120,18 +121,20 @@ public:
     /// Carries out a command if it is enabled. True for every command that is the controller's, enabled or not.
     bool OnCmdMsg(std::uint32_t command);
 
+    /// What a control of that number shows for the point `name`; nothing enabled for a number that isn't in the table.
     VtTCommandState IsCommandEnabled(const std::wstring& name, std::uint32_t command) const;
 
+    /// All commands and controls of the controller.
+    static const VtCControllerCommandTable& GetCommands();
+
     /// How a command shows in a menu, for the active point; nothing for what isn't the controller's.
-    std::optional<VtTMenuState> GetMenuState(std::uint32_t command) const;
+    std::optional<VtTCommandState> GetMenuState(std::uint32_t command) const;
 
 private:
     void ReadBufferSettings();
     void Play(VtEPlayState state);
     bool StepReplay();
     void UpdateRunningIndicator() const;
-    VtTCommandState FrameCommandState(const std::wstring& name, std::uint32_t command) const;
-    void Execute(std::uint32_t command);
     void Store();
 
     VtTSimulationServices services;

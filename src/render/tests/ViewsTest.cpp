@@ -384,19 +384,24 @@ TEST_F(Views, TheActiveOneMayBeAnyView)
     EXPECT_EQ(frame->GetActivePane(), &Pane(1));
 }
 
-TEST_F(Views, CommandsKnowTheirState)
+// A row whose state and deed disagree would show the check on another entry, or on none.
+TEST_F(Views, CommandsCheckWhatTheyHaveSet)
 {
     CreateViews();
     VtCVisualizationViewCommandsHandler commands(*frame);
-    VtTCommandState state;
-    EXPECT_TRUE(commands.GetState(commandMixed, state));
-    EXPECT_TRUE(state.enabled && state.checked);
-    EXPECT_TRUE(commands.Execute(commandWireFrame));
-    EXPECT_EQ(scene->GetGlobalRenderMode(), VtERenderMode::WireFrame);
-    commands.GetState(commandWireFrame, state);
-    EXPECT_TRUE(state.checked);
-    EXPECT_TRUE(commands.GetState(commandFileSave, state));
-    EXPECT_FALSE(state.enabled);
-    EXPECT_FALSE(commands.GetState(12345, state));
+    EXPECT_TRUE(commands.GetState(commandMixed)->checked);
+    for (const auto& group :
+         {std::vector<std::uint32_t>{commandGouraud, commandTextured, commandFlat, commandWireFrame, commandMixed},
+          std::vector<std::uint32_t>{commandSingleView, commandTwoColumns, commandTwoRows, commandFourViews}})
+        for (const std::uint32_t chosen : group)
+        {
+            EXPECT_TRUE(commands.Execute(chosen));
+            for (const std::uint32_t one : group)
+                EXPECT_EQ(commands.GetState(one)->checked, one == chosen) << one << " after " << chosen;
+        }
+    EXPECT_EQ(scene->GetGlobalRenderMode(), VtERenderMode::Mixed);
+    EXPECT_EQ(frame->getSplitter().getLayout(), layoutFour);
+    EXPECT_FALSE(commands.GetState(commandFileSave)->enabled);
+    EXPECT_FALSE(commands.GetState(12345));
     EXPECT_FALSE(commands.Execute(12345));
 }

@@ -6,7 +6,6 @@
 #include <string>
 #include <vector>
 
-#include "host/CommandState.h"
 #include "host/PropertySheets.h"
 #include "simdata/ControllerCommands.h"
 #include "simdata/points/PropertyPage.h"

@@ -1,10 +1,11 @@
-#include "hosts/desktop/controller/ControllerDock.h"
+#include "hosts/desktop/ControllerDock.h"
 
-#include <QApplication>
+#include <QAbstractSpinBox>
+#include <QAction>
 #include <QComboBox>
 #include <QFontDatabase>
 #include <QHBoxLayout>
-#include <QKeySequence>
+#include <QKeyEvent>
 #include <QLabel>
 #include <QLineEdit>
 #include <QProxyStyle>
@@ -16,34 +17,17 @@
 #include <QVBoxLayout>
 
 #include "base/Text.h"
-#include "host/CommandState.h"
 #include "host/Messages.h"
-#include "hosts/desktop/controller/PlayerShortcuts.h"
-#include "hosts/desktop/controller/SpeedControl.h"
-#include "hosts/desktop/controller/ThemedIcon.h"
+#include "hosts/desktop/CommandActions.h"
+#include "hosts/desktop/Wording.h"
 #include "simdata/ControllerCommands.h"
 #include "ui/SimulationDataControllerDialog.h"
-
-// Resources of a static library come in by name, and only from outside every namespace.
-static void LoadResources()
-{
-    Q_INIT_RESOURCE(controller);
-}
 
 namespace desktop
 {
 
 namespace
 {
-
-// Texts by number. Those of command buttons have the number of the command.
-constexpr std::uint32_t textTitle = 6247;
-constexpr std::uint32_t textFrame = 6279;
-constexpr std::uint32_t textTime = 6280;
-constexpr std::uint32_t textPointSettings = 9184;
-constexpr std::uint32_t textPosition = 9185;
-constexpr std::uint32_t textCount = 9186;   ///< %1 frames
-constexpr std::uint32_t textSeconds = 9187; ///< %1 seconds
 
 constexpr int iconSize = 20;
 constexpr int widestNumber = 10; ///< digits of the largest frame number
@@ -62,18 +46,57 @@ public:
 
 QString Insert(const host::Texts& texts, std::uint32_t number, const std::wstring& insertion)
 {
-    return QString::fromStdWString(base::Replace(texts.GetText(number), L"%1", insertion));
+    return ToQt(base::Replace(texts.GetText(number), L"%1", insertion));
 }
 
 } // namespace
 
-ControllerDock::ControllerDock(VtCSimulationDataControllerDialog& shownDialog, const host::Texts& displayTexts,
-                               QWidget* window)
-    : QDockWidget(QString::fromStdWString(displayTexts.GetText(textTitle)), window),
+/// An up-down control over a table of texts. It changes nothing by itself: a click, a key or the wheel goes to
+/// `change`, and the text to show comes by `Show`.
+class SpeedControl : public QAbstractSpinBox
+{
+public:
+    /// `change` takes the steps, negative ones downwards.
+    SpeedControl(std::function<void(int)> change, unsigned lastPosition, QWidget* parent)
+        : QAbstractSpinBox(parent), onChange(std::move(change)), last(lastPosition)
+    {
+        lineEdit()->setReadOnly(true);
+        lineEdit()->setAlignment(Qt::AlignRight);
+        // A click on an arrow must not take the player's keys away.
+        setFocusPolicy(Qt::TabFocus);
+        lineEdit()->setFocusPolicy(Qt::NoFocus);
+        const int arrows = 2 * fontMetrics().height();
+        setFixedWidth(fontMetrics().horizontalAdvance(QStringLiteral("1/32x")) + arrows);
+    }
+
+    void Show(unsigned newPosition, const QString& text)
+    {
+        position = newPosition;
+        lineEdit()->setText(text);
+        update();
+    }
+
+    void stepBy(int steps) override { onChange(steps); }
+
+protected:
+    StepEnabled stepEnabled() const override
+    {
+        return (position > 0 ? StepDownEnabled : StepNone) | (position < last ? StepUpEnabled : StepNone);
+    }
+
+private:
+    std::function<void(int)> onChange;
+    unsigned last;
+    unsigned position = 0;
+};
+
+ControllerDock::ControllerDock(VtCSimulationDataControllerDialog& shownDialog, CommandActions& commandActions,
+                               const host::Texts& displayTexts, QWidget& window)
+    : QDockWidget(Part(displayTexts, textSimulationDock, 0), &window),
       dialog(&shownDialog),
+      actions(commandActions),
       texts(displayTexts)
 {
-    LoadResources();
     setObjectName(QStringLiteral("controllerDock"));
     timer = new QTimer(this);
     QObject::connect(timer, &QTimer::timeout, this,
@@ -93,7 +116,12 @@ ControllerDock::ControllerDock(VtCSimulationDataControllerDialog& shownDialog, c
     layout->addStretch();
     setWidget(content);
 
-    AddShortcuts(window ? *window : *static_cast<QWidget*>(this));
+    // Without a focus of its own a new window gives it to its first field, which would keep the keys.
+    if (!window.focusWidget())
+        window.setFocus();
+    for (QWidget* field :
+         {static_cast<QWidget*>(points), static_cast<QWidget*>(frameEdit), static_cast<QWidget*>(speed)})
+        field->installEventFilter(this);
     QObject::connect(this, &QDockWidget::visibilityChanged, this,
                      [this](bool visible) { OnVisibilityChanged(visible); });
     dialog->OnInitDialog(*this);
@@ -128,19 +156,19 @@ QWidget* ControllerDock::MakePointRow()
                      });
     row->addWidget(points, 1);
 
-    QToolButton* settings = AddButton(row, ControllerCommand::customizePoint, textPointSettings, "customise-point");
+    QToolButton* settings = AddOwnButton(row, ControllerCommand::customizePoint);
     QObject::connect(settings, &QToolButton::clicked, this,
                      [this]
                      {
                          if (dialog)
                              dialog->OnCustomizePoint();
                      });
-    AddCommand(row, ControllerCommand::start, "start");
-    AddCommand(row, ControllerCommand::stop, "halt");
+    AddCommand(row, ControllerCommand::start);
+    AddCommand(row, ControllerCommand::stop);
     row->addSpacing(8);
-    AddCommand(row, ControllerCommand::refreshData, "refresh");
-    AddCommand(row, ControllerCommand::store, "store");
-    AddCommand(row, ControllerCommand::customize, "customise");
+    AddCommand(row, ControllerCommand::refreshData);
+    AddCommand(row, ControllerCommand::store);
+    AddCommand(row, ControllerCommand::customize);
     return widget;
 }
 
@@ -172,13 +200,6 @@ QWidget* ControllerDock::MakeFrameRow()
     frameEdit->setFixedWidth(fontMetrics().horizontalAdvance(QStringLiteral("000000000")));
     Explain(frameEdit, textFrame);
     QObject::connect(frameEdit, &QLineEdit::textEdited, this, [this](const QString& text) { ReadFrameEdit(text); });
-    QObject::connect(frameEdit, &QLineEdit::returnPressed, this,
-                     [this]
-                     {
-                         if (dialog)
-                             dialog->OnFrameNumberEntered();
-                         frameEdit->selectAll();
-                     });
     QObject::connect(frameEdit, &QLineEdit::editingFinished, this, [this] { LeaveFrameEdit(); });
     row->addWidget(frameEdit);
 
@@ -200,15 +221,12 @@ QWidget* ControllerDock::MakePlayRow()
     auto* row = new QHBoxLayout(widget);
     row->setContentsMargins(0, 0, 0, 0);
     row->setSpacing(2);
-    AddCommand(row, firstFrame, "first");
-    AddSpool(row, spoolBack, "spool-back");
-    AddCommand(row, previousFrame, "previous");
-    AddCommand(row, playOnce, "play", true);
-    AddCommand(row, playLoop, "loop", true);
-    AddCommand(row, stopPlay, "stop");
-    AddCommand(row, nextFrame, "next");
-    AddSpool(row, spoolForward, "spool-forward");
-    AddCommand(row, lastFrame, "last");
+    AddCommand(row, firstFrame);
+    AddSpool(row, spoolBack);
+    for (const std::uint32_t command : {previousFrame, playOnce, playLoop, stopPlay, nextFrame})
+        AddCommand(row, command);
+    AddSpool(row, spoolForward);
+    AddCommand(row, lastFrame);
     row->addStretch();
 
     speed = new SpeedControl(
@@ -224,35 +242,37 @@ QWidget* ControllerDock::MakePlayRow()
     return widget;
 }
 
-QToolButton* ControllerDock::AddButton(QHBoxLayout* row, std::uint32_t command, std::uint32_t text, const char* icon)
+QToolButton* ControllerDock::AddButton(QHBoxLayout* row, std::uint32_t command)
 {
     auto* button = new QToolButton(this);
     button->setAutoRaise(true);
-    button->setIcon(MakeThemedIcon(QStringLiteral(":/controller/icons/%1.svg").arg(QLatin1String(icon))));
     button->setIconSize(QSize(iconSize, iconSize));
     button->setFocusPolicy(Qt::TabFocus);
     button->setObjectName(QString::number(command));
-    Explain(button, text);
+    button->setAccessibleName(Plain(actions.Get(command)->text()));
     row->addWidget(button);
-    buttons[command] = button;
     return button;
 }
 
-void ControllerDock::AddCommand(QHBoxLayout* row, std::uint32_t command, const char* icon, bool checkable)
+void ControllerDock::AddCommand(QHBoxLayout* row, std::uint32_t command)
 {
-    QToolButton* button = AddButton(row, command, command, icon);
-    button->setCheckable(checkable);
-    QObject::connect(button, &QToolButton::clicked, this,
-                     [this, command]
-                     {
-                         if (dialog)
-                             dialog->OnCommand(command);
-                     });
+    AddButton(row, command)->setDefaultAction(actions.Get(command));
 }
 
-void ControllerDock::AddSpool(QHBoxLayout* row, std::uint32_t command, const char* icon)
+QToolButton* ControllerDock::AddOwnButton(QHBoxLayout* row, std::uint32_t command)
 {
-    QToolButton* button = AddButton(row, command, command, icon);
+    const QAction& look = *actions.Get(command);
+    QToolButton* button = AddButton(row, command);
+    button->setIcon(look.icon());
+    button->setToolTip(look.toolTip());
+    button->setStatusTip(look.statusTip());
+    ownButtons[command] = button;
+    return button;
+}
+
+void ControllerDock::AddSpool(QHBoxLayout* row, std::uint32_t command)
+{
+    QToolButton* button = AddOwnButton(row, command);
     const auto tell = [this, command](bool held)
     {
         if (dialog)
@@ -262,48 +282,26 @@ void ControllerDock::AddSpool(QHBoxLayout* row, std::uint32_t command, const cha
     QObject::connect(button, &QToolButton::released, this, [tell] { tell(false); });
 }
 
-void ControllerDock::AddShortcuts(QWidget& window)
-{
-    using namespace ControllerCommand;
-    shortcuts = new PlayerShortcuts(window, this);
-    // Without a focus of its own a new window gives it to its first edit, which would keep the keys.
-    if (!window.focusWidget())
-        window.setFocus();
-    shortcuts->Add(QKeySequence(Qt::Key_Space),
-                   [this]
-                   {
-                       if (dialog)
-                           dialog->TogglePlay();
-                   });
-    for (const std::uint32_t command : {playOnce, stopPlay})
-        buttons[command]->setToolTip(QStringLiteral("%1 (%2)").arg(
-            buttons[command]->toolTip(), QKeySequence(Qt::Key_Space).toString(QKeySequence::NativeText)));
-    AddShortcut(Qt::Key_Left, previousFrame);
-    AddShortcut(Qt::Key_Right, nextFrame);
-    AddShortcut(Qt::Key_Home, firstFrame);
-    AddShortcut(Qt::Key_End, lastFrame);
-}
-
-void ControllerDock::AddShortcut(int key, std::uint32_t command)
-{
-    const QKeySequence sequence(key);
-    shortcuts->Add(sequence,
-                   [this, command]
-                   {
-                       if (dialog)
-                           dialog->OnCommand(command);
-                   });
-    QToolButton* button = buttons[command];
-    button->setToolTip(QStringLiteral("%1 (%2)").arg(button->toolTip(), sequence.toString(QKeySequence::NativeText)));
-}
-
-// The first line of a text names the control, the second says what it does.
 void ControllerDock::Explain(QWidget* widget, std::uint32_t text) const
 {
-    const QStringList lines = QString::fromStdWString(texts.GetText(text)).split(QLatin1Char('\n'));
-    widget->setToolTip(lines.front());
-    widget->setStatusTip(lines.back());
-    widget->setAccessibleName(lines.front());
+    widget->setToolTip(Part(texts, text, 0));
+    widget->setStatusTip(Part(texts, text, 1));
+    widget->setAccessibleName(Part(texts, text, 0));
+}
+
+bool ControllerDock::eventFilter(QObject* field, QEvent* event)
+{
+    if (event->type() != QEvent::KeyPress)
+        return QDockWidget::eventFilter(field, event);
+    const int key = static_cast<QKeyEvent*>(event)->key();
+    const bool escape = key == Qt::Key_Escape;
+    if (!escape && key != Qt::Key_Return && key != Qt::Key_Enter)
+        return QDockWidget::eventFilter(field, event);
+    if (escape && field == frameEdit)
+        ReadFrameEdit({});
+    // What was typed counts as soon as the edit has lost the focus.
+    parentWidget()->setFocus();
+    return true;
 }
 
 void ControllerDock::ReadFrameEdit(const QString& text)
@@ -338,7 +336,7 @@ void ControllerDock::ShowPoints(const std::vector<std::wstring>& entries, std::s
     const QSignalBlocker silence(points);
     QStringList items;
     for (const std::wstring& entry : entries)
-        items.append(QString::fromStdWString(entry));
+        items.append(ToQt(entry));
     points->clear();
     points->addItems(items);
     points->setCurrentIndex(static_cast<int>(chosen));
@@ -366,7 +364,7 @@ void ControllerDock::ShowFrame(const VtTShownFrame& newFrame, const std::wstring
 
 void ControllerDock::ShowSpeed(std::uint32_t position, const std::wstring& text)
 {
-    speed->Show(position, QString::fromStdWString(text));
+    speed->Show(position, ToQt(text));
 }
 
 void ControllerDock::ShowCommand(std::uint32_t command, const VtTCommandState& state)
@@ -375,13 +373,11 @@ void ControllerDock::ShowCommand(std::uint32_t command, const VtTCommandState& s
         return points->setEnabled(state.enabled);
     if (command == ControllerCommand::speedControl)
         return speed->setEnabled(state.enabled);
-    const auto at = buttons.find(command);
-    if (at == buttons.end())
-        return;
-    at->second->setEnabled(state.enabled);
     // A spool button is held, not checked; being down shows it.
-    if (at->second->isCheckable())
-        at->second->setChecked(state.checked);
+    if (const auto own = ownButtons.find(command); own != ownButtons.end())
+        own->second->setEnabled(state.enabled);
+    else
+        actions.Show(command, state);
 }
 
 void ControllerDock::OnDialogGone()

@@ -2,6 +2,7 @@
 // PANORAMIC_TEST_PICTURES set to a folder the dock's pictures are left there.
 #include <filesystem>
 
+#include <QAbstractSpinBox>
 #include <QApplication>
 #include <QComboBox>
 #include <QDialog>
@@ -12,7 +13,6 @@
 #include <QLabel>
 #include <QLineEdit>
 #include <QMainWindow>
-#include <QPlainTextEdit>
 #include <QPushButton>
 #include <QSlider>
 #include <QTest>
@@ -20,10 +20,9 @@
 #include <QToolButton>
 
 #include "hosts/common/IniTexts.h"
-#include "hosts/desktop/controller/ControllerDock.h"
-#include "hosts/desktop/controller/PropertySheets.h"
-#include "hosts/desktop/controller/SpeedControl.h"
-#include "hosts/desktop/controller/ThemedIcon.h"
+#include "hosts/desktop/CommandActions.h"
+#include "hosts/desktop/ControllerDock.h"
+#include "hosts/desktop/PropertySheets.h"
 #include "ui/tests/DialogFixture.h"
 
 using namespace ControllerCommand;
@@ -40,6 +39,32 @@ public:
     const desktop::ControllerDock* dock = nullptr;
 };
 
+/// The controller's commands, by way of the dialog as the application sends them.
+class Target : public host::CommandTarget
+{
+public:
+    explicit Target(VtCSimulationDataController& commandedController) : controller(commandedController) {}
+
+    std::vector<host::CommandLook> GetCommands() const override
+    {
+        std::vector<host::CommandLook> looks;
+        VtCSimulationDataController::GetCommands().AddTo(looks);
+        return looks;
+    }
+    std::optional<VtTCommandState> GetMenuState(std::uint32_t command) const override
+    {
+        return controller.GetMenuState(command);
+    }
+    bool OnCmdMsg(std::uint32_t command) override
+    {
+        dialog ? dialog->OnCommand(command) : static_cast<void>(controller.OnCmdMsg(command));
+        return true;
+    }
+
+    VtCSimulationDataController& controller;
+    VtCSimulationDataControllerDialog* dialog = nullptr;
+};
+
 class Dock : public simtest::SimulationTest
 {
 protected:
@@ -52,7 +77,8 @@ protected:
         pane = new QWidget(&window);
         pane->setFocusPolicy(Qt::StrongFocus);
         window.setCentralWidget(pane);
-        dock = new desktop::ControllerDock(*dialog, realTexts, &window);
+        target.dialog = dialog.get();
+        dock = new desktop::ControllerDock(*dialog, actions, realTexts, window);
         panes.dock = dock;
         window.addDockWidget(Qt::BottomDockWidgetArea, dock);
         window.resize(700, 300);
@@ -88,6 +114,8 @@ protected:
     std::unique_ptr<VtCSimulationDataControllerDialog> dialog;
     QMainWindow window;
     QWidget* pane = nullptr;
+    Target target{controller};
+    desktop::CommandActions actions{{&target}, realTexts, window, [] {}};
     desktop::ControllerDock* dock = nullptr;
 };
 
@@ -107,7 +135,7 @@ TEST_F(Dock, ShowsWhatTheDialogSaysAndSendsClicks)
     QTest::mouseClick(&Button(playLoop), Qt::LeftButton);
     EXPECT_TRUE(Button(playLoop).isChecked());
     EXPECT_TRUE(Button(stopPlay).isEnabled());
-    EXPECT_FALSE(dock->findChild<desktop::SpeedControl*>()->isEnabled());
+    EXPECT_FALSE(dock->findChild<QAbstractSpinBox*>("speed")->isEnabled());
     EXPECT_FALSE(dock->findChild<QComboBox*>()->isEnabled());
     Picture("dock-playing");
     QTest::mouseClick(&Button(playLoop), Qt::LeftButton);
@@ -144,15 +172,23 @@ TEST_F(Dock, TakesTypedFramesAndDragsOfTheSlider)
     EXPECT_EQ(Cursor(), 4UL);
     QTest::keyClick(&edit, Qt::Key_Return);
     EXPECT_EQ(Cursor(), 7UL);
-    QTest::keyClick(&edit, Qt::Key_A, Qt::ControlModifier);
-    QTest::keyClick(&edit, Qt::Key_Backspace);
+    QTest::keyClick(&window, Qt::Key_Right);
+    EXPECT_EQ(Cursor(), 8UL) << "Return gives the keys back";
+    edit.setFocus();
+    edit.selectAll();
+    QTest::keyClicks(&edit, "3");
     QTest::keyClick(&edit, Qt::Key_Escape);
     EXPECT_TRUE(dock->isVisible());
-    pane->setFocus();
-    EXPECT_EQ(edit.text(), "7") << "an emptied edit shows the cursor again";
+    EXPECT_EQ(edit.text(), "8");
+    QTest::keyClick(&window, Qt::Key_Left);
+    EXPECT_EQ(Cursor(), 7UL) << "and so does Escape, without the number";
     edit.setFocus();
+    edit.selectAll();
+    QTest::keyClicks(&edit, "5");
+    QTest::keyClick(&edit, Qt::Key_Right, Qt::ControlModifier);
+    EXPECT_EQ(Cursor(), 6UL) << "what was typed counts before a command";
     QTest::mouseClick(&Button(playLoop), Qt::LeftButton);
-    QTest::keyClick(&window, Qt::Key_Space);
+    QTest::keyClick(&window, Qt::Key_F7);
     EXPECT_FALSE(controller.HasPlayState()) << "disabled, the edit gives the keys back";
 
     Slider().setValue(3);
@@ -163,7 +199,7 @@ TEST_F(Dock, TakesTypedFramesAndDragsOfTheSlider)
 
 TEST_F(Dock, StepsTheSpeedByTheTable)
 {
-    auto* speed = dock->findChild<desktop::SpeedControl*>();
+    auto* speed = dock->findChild<QAbstractSpinBox*>("speed");
     speed->stepBy(1);
     EXPECT_EQ(controller.GetSpeed(), 2.0);
     EXPECT_EQ(speed->text(), "2x");
@@ -172,53 +208,6 @@ TEST_F(Dock, StepsTheSpeedByTheTable)
     speed->stepBy(-6);
     EXPECT_EQ(controller.GetSpeed(), 0.03125);
     EXPECT_EQ(speed->text(), "1/32x");
-}
-
-TEST_F(Dock, HasThePlayersKeysInTheWholeWindow)
-{
-    for (const bool closed : {false, true})
-    {
-        SCOPED_TRACE(closed ? "dock closed" : "dock open");
-        dock->setVisible(!closed);
-        router.ShowFrame(L"Live", 4);
-        QTest::keyClick(pane, Qt::Key_Right);
-        EXPECT_EQ(Cursor(), 5UL);
-        QTest::keyClick(pane, Qt::Key_Left);
-        EXPECT_EQ(Cursor(), 4UL);
-        QTest::keyClick(pane, Qt::Key_End);
-        EXPECT_EQ(Cursor(), 10UL);
-        QTest::keyClick(pane, Qt::Key_Home);
-        EXPECT_EQ(Cursor(), 1UL);
-        QTest::keyClick(pane, Qt::Key_Space);
-        EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayOnce);
-        QTest::keyClick(pane, Qt::Key_Space);
-        EXPECT_FALSE(controller.HasPlayState());
-    }
-    dock->show();
-    QTest::qWait(0);
-    EXPECT_EQ(FrameEdit().text(), "1") << "shown again it has caught up";
-}
-
-TEST_F(Dock, LeavesKeysToTextEdits)
-{
-    QPlainTextEdit reading(&window);
-    reading.setReadOnly(true);
-    reading.setTextInteractionFlags(Qt::TextBrowserInteraction);
-    QLineEdit line(&window);
-    reading.show();
-    line.show();
-    for (QWidget* widget : {static_cast<QWidget*>(&reading), static_cast<QWidget*>(&line)})
-    {
-        widget->setFocus();
-        for (const Qt::Key key : {Qt::Key_Space, Qt::Key_Home, Qt::Key_Right, Qt::Key_Left, Qt::Key_End})
-            QTest::keyClick(widget, key);
-        EXPECT_EQ(Cursor(), 4UL);
-        EXPECT_FALSE(controller.HasPlayState());
-    }
-    EXPECT_EQ(line.text(), " ");
-    Button(playLoop).setFocus();
-    QTest::keyClick(&Button(playLoop), Qt::Key_Space);
-    EXPECT_EQ(controller.GetPlayState(), VtEPlayState::PlayLoop) << "the key presses the button with the focus";
 }
 
 TEST_F(Dock, ChoosesPointsAndFollowsTheirList)
@@ -238,7 +227,7 @@ TEST_F(Dock, OutlivesItsDialog)
 {
     dialog.reset();
     EXPECT_FALSE(dock->widget()->isEnabled());
-    QTest::keyClick(pane, Qt::Key_Right);
+    target.dialog = nullptr;
     dock->hide();
     dock->show();
     EXPECT_EQ(Cursor(), 4UL);

@@ -1,4 +1,4 @@
-#include "hosts/desktop/controller/PropertySheets.h"
+#include "hosts/desktop/PropertySheets.h"
 
 #include <QApplication>
 #include <QDialog>

@@ -1,4 +1,4 @@
-#include "hosts/desktop/controller/ThemedIcon.h"
+#include "hosts/desktop/Icons.h"
 
 #include <QBuffer>
 #include <QFile>
@@ -8,6 +8,12 @@
 #include <QPainter>
 #include <QPalette>
 #include <QPixmapCache>
+
+// Resources of a static library come in by name, and only from outside every namespace.
+static void LoadResources()
+{
+    Q_INIT_RESOURCE(icons);
+}
 
 namespace
 {
@@ -64,8 +70,10 @@ private:
 
 } // namespace
 
-QIcon desktop::MakeThemedIcon(const QString& file)
+QIcon desktop::MakeIcon(const QString& name)
 {
+    LoadResources();
+    const QString file = ":/icons/" + name + ".svg";
     QFile drawing(file);
     if (!drawing.open(QIODevice::ReadOnly))
         return {};
