@@ -207,7 +207,10 @@ const VtCControllerCommandTable& VtCSimulationDataController::GetCommands()
 VtTCommandState VtCSimulationDataController::IsCommandEnabled(const std::wstring& name, std::uint32_t command) const
 {
     const auto* row = GetCommands().Find(command);
-    return row ? row->state({*this, name}, row->value) : VtTCommandState{};
+    // What stands in menus alone hangs on no point that could be asked for.
+    if (!row || row->look.group == CommandGroup::source || command == ControllerCommand::refreshChannels)
+        return {};
+    return row->state({*this, name}, row->value);
 }
 
 std::optional<VtTCommandState> VtCSimulationDataController::GetMenuState(std::uint32_t command) const

@@ -121,7 +121,8 @@ public:
     /// Carries out a command if it is enabled. True for every command that is the controller's, enabled or not.
     bool OnCmdMsg(std::uint32_t command);
 
-    /// What a control of that number shows for the point `name`; nothing enabled for a number that isn't in the table.
+    /// What a control of that number shows for the point `name`; nothing enabled for a number that is no control's,
+    /// such as what stands in menus alone.
     VtTCommandState IsCommandEnabled(const std::wstring& name, std::uint32_t command) const;
 
     /// All commands and controls of the controller.
