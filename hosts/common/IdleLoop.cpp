@@ -15,6 +15,7 @@ namespace
 {
 
 constexpr std::uint32_t idleWithoutSink = 10; // milliseconds; else a suspended cycle would burn a core
+constexpr std::uint32_t sameFailure = 60000;  // milliseconds within which it counts as the same
 
 } // namespace
 
@@ -49,35 +50,59 @@ bool IdleLoop::Raise()
         IdleLoop& loop;
     } guard(*this);
 
+    failed = false;
     bool wanted = false;
     const std::size_t count = connections.size();
     for (std::size_t i = 0; i < count; ++i)
         if (host::IIdleProcessingEvents* sink = connections[i].sink)
-        {
-            std::int32_t handled = 0;
-            sink->OnIdle(handled);
-            wanted = wanted || handled != 0;
-        }
+            wanted = Tell(*sink) || wanted;
     return wanted;
+}
+
+bool IdleLoop::Tell(host::IIdleProcessingEvents& sink)
+{
+    try
+    {
+        std::int32_t handled = 0;
+        sink.OnIdle(handled);
+        return handled != 0;
+    }
+    catch (const host::InterfaceError& error)
+    {
+        ShowFailure({.number = messageInterfaceFailed,
+                     .first = base::Wide(error.InterfaceId()),
+                     .second = std::to_wstring(error.ResultCode()),
+                     .severity = host::Severity::error});
+    }
+    catch (const std::exception& error)
+    {
+        ShowFailure({.text = base::Wide(error.what()), .severity = host::Severity::error});
+    }
+    return false;
+}
+
+void IdleLoop::ShowFailure(const host::Message& failure)
+{
+    failed = true;
+    const std::wstring told = failure.text + failure.first + L' ' + failure.second;
+    const std::uint32_t now = clock.TickCount();
+    const bool known = told == lastFailure && now - lastFailureTick < sameFailure;
+    lastFailure = told;
+    lastFailureTick = now;
+    if (!known)
+        messages.Show(failure);
 }
 
 bool IdleLoop::Run(const std::function<bool()>& goesOn)
 {
-    try
+    while (goesOn())
     {
-        while (goesOn())
-            if (!Raise())
-                clock.Sleep(idleWithoutSink);
-        return true;
+        if (!Raise())
+            clock.Sleep(idleWithoutSink);
+        if (failed)
+            return false;
     }
-    catch (const host::InterfaceError& error)
-    {
-        messages.Show({.number = messageInterfaceFailed,
-                       .first = base::Wide(error.InterfaceId()),
-                       .second = std::to_wstring(error.ResultCode()),
-                       .severity = host::Severity::error});
-        return false;
-    }
+    return true;
 }
 
 } // namespace hosts

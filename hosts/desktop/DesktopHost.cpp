@@ -1,5 +1,6 @@
 #include "hosts/desktop/DesktopHost.h"
 
+#include "base/FrameSuspension.h"
 #include "hosts/common/HostMessages.h"
 
 namespace desktop
@@ -39,12 +40,12 @@ DesktopHost::DesktopHost()
       settings(hosts::ConfigurationFile("settings.ini"), messages),
       paths(configurationFile, data, module),
       loop(clock, messages),
-      pump(loop, clock, messages),
-      progress(clock, pump),
+      pump(loop, clock),
+      progress(clock),
       variables(loop),
       questions(texts)
 {
-    messages.SetBusy([this] { return pump.IsSuspended(); });
+    messages.SetBusy([] { return VtCFrameSuspension::AreStepsSuspended(); });
     hosts::WarnOfFiles(messages, texts, configurationFile);
 }
 

@@ -18,7 +18,6 @@
 #include "hosts/desktop/IdlePump.h"
 #include "hosts/desktop/MessageBoxes.h"
 #include "hosts/desktop/PaneGraphics.h"
-#include "hosts/desktop/PausedClock.h"
 #include "hosts/desktop/ProgressBox.h"
 #include "hosts/desktop/PropertySheets.h"
 

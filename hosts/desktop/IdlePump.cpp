@@ -1,14 +1,8 @@
 #include "hosts/desktop/IdlePump.h"
 
 #include <algorithm>
-#include <string>
 
-#include "base/Text.h"
-#include "host/InterfaceError.h"
-#include "host/Messages.h"
-#include "hosts/common/HostMessages.h"
 #include "hosts/common/IdleLoop.h"
-#include "hosts/desktop/PausedClock.h"
 
 namespace desktop
 {
@@ -17,12 +11,12 @@ namespace
 {
 
 constexpr std::int64_t millisecond = 1000000;
-constexpr std::uint32_t pauseWithoutSink = 10;
+constexpr std::uint32_t pauseWithoutSink = 10; // milliseconds
+constexpr std::uint32_t longestPause = 20;     // a change is drawn by the event behind it
 
 } // namespace
 
-IdlePump::IdlePump(hosts::IdleLoop& idleLoop, PausedClock& pausedClock, host::MessageService& messageService)
-    : loop(idleLoop), clock(pausedClock), messages(messageService)
+IdlePump::IdlePump(hosts::IdleLoop& idleLoop, PausedClock& pausedClock) : loop(idleLoop), clock(pausedClock)
 {
     timer.setSingleShot(true);
     timer.setTimerType(Qt::PreciseTimer);
@@ -54,15 +48,9 @@ void IdlePump::Hurry()
     Arm(due);
 }
 
-void IdlePump::Resume()
-{
-    if (--suspended == 0 && !raising && !failed)
-        Arm(due);
-}
-
 void IdlePump::OnTimeout()
 {
-    if (raising || suspended > 0 || failed)
+    if (raising)
         return;
 
     // Periods follow one another, so that the timer's whole milliseconds even out; what is late is not caught up.
@@ -71,24 +59,9 @@ void IdlePump::OnTimeout()
 
     raising = true;
     clock.BeginIdleEvent();
-    bool wanted = false;
-    try
-    {
-        wanted = loop.Raise();
-    }
-    catch (const host::InterfaceError& error)
-    {
-        // It would fail again with the next event.
-        failed = true;
-        messages.Show({.number = hosts::messageInterfaceFailed,
-                       .first = base::Wide(error.InterfaceId()),
-                       .second = std::to_wstring(error.ResultCode()),
-                       .severity = host::Severity::error});
-    }
-    std::uint32_t pause = clock.EndIdleEvent();
+    const bool wanted = loop.Raise();
+    std::uint32_t pause = std::min(clock.EndIdleEvent(), longestPause);
     raising = false;
-    if (failed)
-        return;
     if (!wanted)
         pause = std::max(pause, pauseWithoutSink);
     if (flying)

@@ -9,7 +9,6 @@
 #include <QVBoxLayout>
 
 #include "host/Clock.h"
-#include "hosts/desktop/IdlePump.h"
 #include "hosts/desktop/Wording.h"
 
 namespace desktop
@@ -24,7 +23,7 @@ constexpr int boxWidth = 420;
 
 } // namespace
 
-ProgressBox::ProgressBox(const host::Clock& ticker, IdlePump& idlePump) : clock(ticker), pump(idlePump) {}
+ProgressBox::ProgressBox(const host::Clock& ticker) : clock(ticker) {}
 
 ProgressBox::~ProgressBox() = default;
 
@@ -39,7 +38,7 @@ ProgressBox::Activity& ProgressBox::Open(long id)
 {
     if (activities.empty())
     {
-        pump.Suspend();
+        suspended.emplace(VtCFrameSuspension::Extent::steps);
         started = updated = clock.TickCount();
     }
     return activities.emplace_back(Activity{id, {}, {}});
@@ -48,7 +47,7 @@ ProgressBox::Activity& ProgressBox::Open(long id)
 void ProgressBox::Close()
 {
     box.reset();
-    pump.Resume();
+    suspended.reset();
 }
 
 void ProgressBox::ConnectProgressActivity(long id, const std::wstring& title, const std::wstring& text)

@@ -2,10 +2,12 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <vector>
 
 #include <QString>
 
+#include "base/FrameSuspension.h"
 #include "host/Progress.h"
 
 class QDialog;
@@ -21,8 +23,6 @@ class Clock;
 namespace desktop
 {
 
-class IdlePump;
-
 /// Long work as a box with a title, what is being done, and a bar; of several activities the innermost. Work that is
 /// done before the box would be seen gets none.
 ///
@@ -30,8 +30,8 @@ class IdlePump;
 class ProgressBox : public host::Progress
 {
 public:
-    /// Both outlive this.
-    ProgressBox(const host::Clock& ticker, IdlePump& idlePump);
+    /// `ticker` outlives this.
+    explicit ProgressBox(const host::Clock& ticker);
     ~ProgressBox() override;
 
     /// The box opens over `window`; null keeps it closed.
@@ -61,7 +61,7 @@ private:
     void MakeBox();
 
     const host::Clock& clock;
-    IdlePump& pump;
+    std::optional<VtCFrameSuspension> suspended; ///< while there is an activity
     QWidget* parent = nullptr;
     std::vector<Activity> activities;
     std::uint32_t started = 0;

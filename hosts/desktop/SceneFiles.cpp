@@ -8,6 +8,7 @@
 #include "app/PanoramicDocument.h"
 #include "assets/AssetManager.h"
 #include "base/AtomicFile.h"
+#include "base/FrameSuspension.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/common/IniTexts.h"
@@ -42,19 +43,6 @@ bool HasExtension(const std::wstring& path, const wchar_t* extension)
     return base::EqualsNoCase(base::Wide(base::NativePath(path).extension().string()), extension);
 }
 
-/// No idle events, as one would find half a scene.
-class Pause
-{
-public:
-    explicit Pause(IdlePump& idlePump) : pump(idlePump) { pump.Suspend(); }
-    ~Pause() { pump.Resume(); }
-    Pause(const Pause&) = delete;
-    Pause& operator=(const Pause&) = delete;
-
-private:
-    IdlePump& pump;
-};
-
 } // namespace
 
 SceneFiles::SceneFiles(VtCPanoramicApp& application, DesktopHost& desktopHost, StateFile& stateFile,
@@ -81,7 +69,7 @@ void SceneFiles::New()
 {
     if (!MayClose())
         return;
-    const Pause pause(host.GetPump());
+    const VtCFrameSuspension suspended; // a step or a picture would find half a scene
     CloseScene();
     host.GetDocumentManager()->NewDocument();
     changed();
@@ -131,7 +119,7 @@ bool SceneFiles::OpenScene(const std::wstring& path)
 {
     if (!CanRead(path) || !MayClose())
         return false;
-    const Pause pause(host.GetPump());
+    const VtCFrameSuspension suspended; // a step or a picture would find half a scene
     // A scene takes its data with it when it closes; the source that the user chose serves the next one too.
     VtCSimulationDataController* controller = app.GetController();
     const std::wstring source = controller ? controller->GetRouter().GetActivePointName(0) : std::wstring();
@@ -176,7 +164,7 @@ void SceneFiles::CloseScene()
 bool SceneFiles::LoadData(const std::wstring& path)
 {
     VtCSimulationDataController* controller = app.GetController();
-    const Pause pause(host.GetPump());
+    const VtCFrameSuspension suspended(VtCFrameSuspension::Extent::steps);
     if (!controller || !controller->LoadMotionData(path))
         return false;
     dataPath = path;

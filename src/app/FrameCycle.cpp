@@ -6,7 +6,7 @@
 #include <fmt/format.h>
 #include <fmt/xchar.h>
 
-#include "app/OnIdleSink.h"
+#include "base/FrameSuspension.h"
 #include "host/Clock.h"
 #include "host/Frame.h"
 
@@ -16,6 +16,14 @@ namespace
 const std::wstring frameRateVariable = L"fps";
 
 } // namespace
+
+void VtCOnIdleSink::OnIdle(std::int32_t& handled)
+{
+    if (VtCFrameSuspension::AreStepsSuspended())
+        return;
+    handled = 1;
+    cycle.IdleStep();
+}
 
 VtCFrameCycle::VtCFrameCycle(host::Clock& hostClock, VtIFrameWork& frameWork) : clock(hostClock), work(frameWork) {}
 
@@ -37,7 +45,8 @@ std::int32_t VtCFrameCycle::IdleStep()
         if (work.HasGraphicsSession() && work.IsSceneLoaded())
         {
             work.RenderCurrentView();
-            work.RenderViewerFrame();
+            if (work.IsFrameDue())
+                work.RenderViewerFrame();
         }
     }
     UpdateFrameRateDisplay();
@@ -107,7 +116,7 @@ void VtCFrameCycle::SetFrameRateText(const std::wstring& text)
 
 void VtCFrameCycle::RedrawNow()
 {
-    if (!redrawAllowed)
+    if (VtCFrameSuspension::ArePicturesSuspended())
         return;
     work.RenderCurrentView();
     work.RenderViewerFrame();
@@ -120,10 +129,7 @@ void VtCFrameCycle::ConnectIdleSink()
     idleSource = variables->GetIdleSource();
     if (!idleSource)
         return;
-    // Made once and kept: the cycle may be suspended from within the sink's own event.
-    if (!sink)
-        sink = std::make_unique<VtCOnIdleSink>(*this);
-    idleCookie = idleSource->Advise(*sink);
+    idleCookie = idleSource->Advise(sink);
     idleSinkConnected = true;
 }
 

@@ -1,18 +1,32 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
 #include <string>
+
+#include "host/Idle.h"
 
 namespace host
 {
 class Clock;
-class IdleSource;
 class MainWindow;
 class Variables;
 } // namespace host
 
-class VtCOnIdleSink;
+class VtCFrameCycle;
+
+/// Takes the host's idle events and makes one idle step of each. It holds no state of its own.
+class VtCOnIdleSink : public host::IIdleProcessingEvents
+{
+public:
+    explicit VtCOnIdleSink(VtCFrameCycle& frameCycle) : cycle(frameCycle) {}
+
+    /// `handled` becomes 1, as the cycle wants every idle event it can get. While the cycle is suspended
+    /// (`VtCFrameSuspension`) it stays as it is, and nothing happens.
+    void OnIdle(std::int32_t& handled) override;
+
+private:
+    VtCFrameCycle& cycle;
+};
 
 /// What one idle step works on. The application object implements it.
 class VtIFrameWork
@@ -29,6 +43,9 @@ public:
     virtual bool HasGraphicsSession() const = 0;
     virtual bool IsSceneLoaded() const = 0;
     virtual void RenderCurrentView() = 0;
+
+    /// Would the next frame show something else than the last?
+    virtual bool IsFrameDue() = 0;
     virtual void RenderViewerFrame() = 0;
 
     /// Frames a second, averaged; 0.0 while the viewer has none.
@@ -37,9 +54,13 @@ public:
 
 /// The frame cycle: what happens in one short pass, each time the host's loop runs idle.
 ///
-/// Bodies move first (the controller's step), observers follow (`RenderCurrentView`), the viewer draws last. A step
-/// that found no data is tried again after the retry interval, counted from the last retry; pictures go on meanwhile.
-/// Everything runs on the thread that owns the windows. A steady pass allocates nothing.
+/// Bodies move first (the controller's step), observers follow (`RenderCurrentView`), the viewer draws last, and only a
+/// frame that would show something new. A step that found no data is tried again after the retry interval, counted from
+/// the last retry; pictures go on meanwhile. Everything runs on the thread that owns the windows. A steady pass
+/// allocates nothing.
+///
+/// What must not be disturbed by a step or a picture takes a `VtCFrameSuspension` for as long as that lasts. What a
+/// service throws leaves `IdleStep` with the cycle unchanged; the host shows it, and raises its next event as ever.
 class VtCFrameCycle
 {
 public:
@@ -63,13 +84,11 @@ public:
     /// hysteresis; an empty text in every pass while no scene is loaded.
     void UpdateFrameRateDisplay();
 
-    /// A frame outside of the idle step; nothing while a redraw isn't allowed.
+    /// A frame outside of the idle step, also when it would show nothing new; none while pictures are suspended.
     void RedrawNow();
-    void SetRedrawAllowed(bool allowed) { redrawAllowed = allowed; }
-    bool IsRedrawAllowed() const { return redrawAllowed; }
 
-    /// Starts the cycle, or takes it up again after `DisconnectIdleSink`. Without idle events from the host nothing
-    /// happens. An operation that rebuilds the scene graph or handles the host's events suspends the cycle around it.
+    /// The host's start and end of the cycle, which don't count: one call undoes the other. Without idle events from
+    /// the host nothing happens. Connecting doesn't end a suspension.
     void ConnectIdleSink();
     void DisconnectIdleSink();
     bool IsIdleSinkConnected() const { return idleSinkConnected; }
@@ -89,14 +108,13 @@ private:
     host::MainWindow* hostMainWindow = nullptr;
     host::Variables* variables = nullptr;
     host::IdleSource* idleSource = nullptr;
-    std::unique_ptr<VtCOnIdleSink> sink;
+    VtCOnIdleSink sink{*this}; ///< kept, as the cycle may be disconnected from within the sink's own event
 
     std::int32_t dataStepArmed = 1; ///< the last data step's result: 1 the next may follow at once, 0 it must wait
     std::int64_t retryStart = 0;    ///< counter at the last retry; 0 not taken yet
     std::int32_t frameCounter = 0;
     float lastFrameRate = 0.0F; ///< as last published
     std::wstring frameRateText;
-    bool redrawAllowed = true;
     bool idleSinkConnected = false;
     std::uint32_t idleCookie = 0;
 };

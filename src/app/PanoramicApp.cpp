@@ -3,8 +3,10 @@
 #include <cstdlib>
 #include <filesystem>
 
+#include <osg/Notify>
+#include <osgDB/Registry>
+
 #include "app/GlidePanelToolBarEventsSink.h"
-#include "app/GraphicsSession.h"
 #include "app/PanoramicDocument.h"
 #include "assets/AssetManager.h"
 #include "base/Paths.h"
@@ -47,6 +49,18 @@ constexpr const wchar_t* sceneFilter = L"Scene Config Files (*.xml)|*.xml||";
 constexpr const wchar_t* sceneExtension = L".xml";
 
 } // namespace
+
+std::unique_ptr<VtCGraphicsSession> graphicsSession;
+
+VtCGraphicsSession::VtCGraphicsSession()
+{
+    osg::setNotifyLevel(osg::WARN);
+}
+
+VtCGraphicsSession::~VtCGraphicsSession()
+{
+    osgDB::Registry::instance()->clearObjectCache();
+}
 
 VtCPanoramicApp::VtCPanoramicApp(host::Host& programAround)
     : host(programAround), messageHandler(applicationName), cycle(programAround.GetClock(), *this)
@@ -118,8 +132,6 @@ void VtCPanoramicApp::ConnectViewer()
     services.clock = &host.GetClock();
     services.moduleDirectory = GetModuleDirectory();
     services.multisampling = [this] { return multisampling; };
-    services.disconnectIdle = [this] { DisconnectIdleSink(); };
-    services.connectIdle = [this] { ConnectIdleSink(); };
     services.hasScene = [this] { return IsSceneLoaded(); };
     services.activeView = [this]() -> osgViewer::View*
     {
@@ -333,6 +345,7 @@ std::optional<VtTCommandState> VtCPanoramicApp::GetMenuState(std::uint32_t comma
 
 bool VtCPanoramicApp::OnCmdMsg(std::uint32_t command)
 {
+    requestViewerRedraw(); // most of them change the picture
     const VtCPanoramicDocument* document = GetActiveDocument();
     if (document && document->GetChildFrame() && document->GetChildFrame()->getCommands().Execute(command))
         return true;
@@ -397,6 +410,11 @@ std::int32_t VtCPanoramicApp::Step()
 bool VtCPanoramicApp::HasGraphicsSession() const
 {
     return graphicsSession != nullptr;
+}
+
+bool VtCPanoramicApp::IsFrameDue()
+{
+    return IsRunning() || isViewerFrameDue();
 }
 
 void VtCPanoramicApp::RenderViewerFrame()

@@ -33,6 +33,21 @@ class VtCSimulationDataCustomizeSheet;
 class VtISceneListener;
 struct VtTSceneServices;
 
+/// Its existence means that the scene graph library is set up for the process. The first document makes it, and it
+/// stays until the component shuts down. The idle step draws only while it exists.
+class VtCGraphicsSession
+{
+public:
+    /// Brings the library's reports down to warnings and errors: at its usual level it tells about every driver.
+    VtCGraphicsSession();
+    ~VtCGraphicsSession();
+    VtCGraphicsSession(const VtCGraphicsSession&) = delete;
+    VtCGraphicsSession& operator=(const VtCGraphicsSession&) = delete;
+};
+
+/// The one of the process; null while there is none.
+extern std::unique_ptr<VtCGraphicsSession> graphicsSession;
+
 /// The application object: what the host drives, and what everything outermost reaches the others by.
 ///
 /// The component has no `main` and no loop. A host makes one of these, calls the stages below in the order they stand
@@ -155,6 +170,7 @@ private:
     bool HasPlayState() const override;
     std::int32_t Step() override;
     bool HasGraphicsSession() const override;
+    bool IsFrameDue() override;
     void RenderViewerFrame() override;
     double GetFrameRate() const override;
 

@@ -4,7 +4,6 @@
 #include <system_error>
 
 #include "app/DayLight.h"
-#include "app/GraphicsSession.h"
 #include "app/PanoramicApp.h"
 #include "app/SceneLoader.h"
 #include "base/Paths.h"
@@ -89,16 +88,18 @@ void VtCPanoramicDocument::MakeChildFrame()
     host::ViewWindows* windows = app.GetHost().GetViewWindows();
     if (!windows)
         return;
-    childFrame =
-        std::make_unique<VtCChildFrame>(VtTChildFrameServices{.document = *this,
-                                                              .observers = *observers,
-                                                              .interaction = *this,
-                                                              .mouseInputManager = *mouseInputManager,
-                                                              .windows = *windows,
-                                                              .selection = app.GetHost().GetSelection(),
-                                                              .clock = app.GetHost().GetClock(),
-                                                              .disconnectIdle = [this] { app.DisconnectIdleSink(); },
-                                                              .connectIdle = [this] { app.ConnectIdleSink(); }});
+    childFrame = std::make_unique<VtCChildFrame>(VtTChildFrameServices{.document = *this,
+                                                                       .observers = *observers,
+                                                                       .interaction = *this,
+                                                                       .mouseInputManager = *mouseInputManager,
+                                                                       .windows = *windows,
+                                                                       .clock = app.GetHost().GetClock()});
+}
+
+void VtCPanoramicDocument::SetModified(bool flag)
+{
+    SetModifiedFlag(flag);
+    requestViewerRedraw();
 }
 
 bool VtCPanoramicDocument::OnNewDocument()

@@ -46,7 +46,7 @@ public:
 
     VtCScene3D* GetScene() const override { return scene; }
     void SetScene(VtCScene3D* newScene) override { scene = newScene; }
-    void SetModified(bool flag) override { SetModifiedFlag(flag); }
+    void SetModified(bool flag) override;
     VtTSceneServices& GetServices() override;
 
     VtC3DObservers& GetObservers() const { return *observers; }

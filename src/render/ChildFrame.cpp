@@ -23,12 +23,6 @@ constexpr std::uint32_t creationTimer = 1;
 constexpr std::uint32_t creationDelay = 250; // milliseconds
 constexpr std::uint32_t pauseTime = 100;
 
-void Tell(const std::function<void()>& function)
-{
-    if (function)
-        function();
-}
-
 } // namespace
 
 VtCChildFrame::VtCChildFrame(VtTChildFrameServices frameServices)
@@ -36,7 +30,6 @@ VtCChildFrame::VtCChildFrame(VtTChildFrameServices frameServices)
       commands(std::make_unique<VtCVisualizationViewCommandsHandler>(*this)),
       window(services.windows.MakeChildFrame())
 {
-    renderingEnabled = false;
     Pause();
     createViewer();
     splitter = std::make_unique<VtCSplitterEx>(*this, window->GetSplitter());
@@ -89,7 +82,7 @@ void VtCChildFrame::CreateViews()
         });
     viewsCreated = true;
     renderEmptyFrame(false);
-    renderingEnabled = true;
+    undrawn.reset();
     Pause();
     window->KillTimer(creationTimer);
 }
@@ -206,13 +199,12 @@ void VtCChildFrame::SetFrameHidden(bool flag)
         window->GetSplitter().Hide();
         return;
     }
-    Tell(services.disconnectIdle);
-    renderingEnabled = false;
+    {
+        const VtCFrameSuspension suspended;
+        Pause();
+        window->GetSplitter().ShowMaximised();
+        splitter->forEachView([](VtCPanoramicView& view) { view.OnSize(); });
+    }
     Pause();
-    window->GetSplitter().ShowMaximised();
-    splitter->forEachView([](VtCPanoramicView& view) { view.OnSize(); });
-    renderingEnabled = true;
-    Pause();
-    Tell(services.connectIdle);
     renderEmptyFrame(true);
 }

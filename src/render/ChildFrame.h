@@ -1,8 +1,9 @@
 #pragma once
 
-#include <functional>
 #include <memory>
+#include <optional>
 
+#include "base/FrameSuspension.h"
 #include "render/Base3DView.h"
 #include "render/SplitterEx.h"
 
@@ -27,8 +28,6 @@ struct VtTChildFrameServices
     host::ViewWindows& windows;
     host::Selection& selection;
     host::Clock& clock;
-    std::function<void()> disconnectIdle; ///< suspends the frame cycle
-    std::function<void()> connectIdle;    ///< resumes it
 };
 
 /// The frame of one scene: its window with the grid of views, and which of them is active.
@@ -102,6 +101,7 @@ private:
     void Pause() const;
 
     VtTChildFrameServices services;
+    std::optional<VtCFrameSuspension> undrawn{VtCFrameSuspension::Extent::pictures}; ///< until the views are made
     std::unique_ptr<VtCVisualizationViewCommandsHandler> commands;
     std::unique_ptr<host::ChildFrameWindow> window;
     VtCBase3DView* activeView = nullptr;

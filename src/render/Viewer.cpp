@@ -14,12 +14,8 @@
 #include "host/ViewWindows.h"
 #include "render/CompositeViewer.h"
 #include "render/GpRenderer.h"
-#include "render/Statistics.h"
-#include "render/ViewerStats.h"
 
-bool viewerReady = false;
-bool renderingEnabled = true;
-osg::ref_ptr<osg::Stats> viewerStats;
+VtCRenderingGate renderingEnabled;
 
 namespace
 {
@@ -33,10 +29,15 @@ constexpr double landscapeAngle = 80.0;
 
 constexpr unsigned int multisamples = 8;
 
-VtTViewerServices services;
-osg::ref_ptr<VtCOsgCompositeViewer> viewer;
-osg::ref_ptr<osg::GraphicsContext> sharedContext;
-host::Window* sharedContextWindow = nullptr;
+/// All that the viewer keeps for the process.
+struct Values
+{
+    VtTViewerServices services;
+    osg::ref_ptr<VtCOsgCompositeViewer> viewer;
+    osg::ref_ptr<osg::Stats> stats;
+    osg::ref_ptr<osg::GraphicsContext> sharedContext;
+    host::Window* sharedContextWindow = nullptr; ///< not owned
+} values;
 
 template <class Result>
 Result Ask(const std::function<Result()>& function)
@@ -44,31 +45,19 @@ Result Ask(const std::function<Result()>& function)
     return function ? function() : Result();
 }
 
-void Tell(const std::function<void()>& function)
-{
-    if (function)
-        function();
-}
-
 void Pause()
 {
-    if (services.clock)
-        services.clock->Sleep(pause);
-}
-
-void EnableRendering(bool flag)
-{
-    renderingEnabled = flag;
-    Pause();
+    if (values.services.clock)
+        values.services.clock->Sleep(pause);
 }
 
 /// Fonts and other data are looked up beside the program.
 void PublishModuleDirectory()
 {
-    if (services.moduleDirectory.empty())
+    if (values.services.moduleDirectory.empty())
         return;
 
-    const std::string directory = base::NativePath(services.moduleDirectory).string();
+    const std::string directory = base::NativePath(values.services.moduleDirectory).string();
     setenv("OSG_FILE_PATH", directory.c_str(), 1);
     // The library has read the variable already if anything was loaded before.
     osgDB::FilePathList& paths = osgDB::Registry::instance()->getDataFilePathList();
@@ -91,7 +80,7 @@ osg::ref_ptr<osg::GraphicsContext::Traits> MakeTraits()
     traits->red = traits->green = traits->blue = traits->alpha = 8;
     traits->depth = 24;
     traits->stencil = 8;
-    if (Ask(services.multisampling))
+    if (Ask(values.services.multisampling))
         traits->samples = multisamples;
     return traits;
 }
@@ -99,8 +88,8 @@ osg::ref_ptr<osg::GraphicsContext::Traits> MakeTraits()
 host::Rectangle UsedRectangle(const host::Rectangle& rectangle)
 {
     host::Rectangle used = rectangle;
-    if ((used.width <= 0 || used.height <= 0) && sharedContextWindow)
-        used = sharedContextWindow->GetClientRectangle();
+    if ((used.width <= 0 || used.height <= 0) && values.sharedContextWindow)
+        used = values.sharedContextWindow->GetClientRectangle();
     used.width = std::max(1, used.width);
     used.height = std::max(1, used.height);
     return used;
@@ -122,103 +111,118 @@ void SetUpProjection(osg::Camera& camera, int width, int height)
 
 bool CardNeedsEmptyFrames()
 {
-    const std::wstring renderer = base::ToLower(base::Wide(Ask(services.cardRenderer)));
+    const std::wstring renderer = base::ToLower(base::Wide(Ask(values.services.cardRenderer)));
     return renderer.find(L"nvs") != std::wstring::npos || renderer.find(L"geforce") != std::wstring::npos;
 }
 
 void DrawWithoutScene(osgViewer::View& view, bool suspendIdle)
 {
-    if (suspendIdle)
     {
-        Tell(services.disconnectIdle);
-        EnableRendering(false);
+        std::optional<VtCFrameSuspension> suspended;
+        if (suspendIdle)
+        {
+            suspended.emplace();
+            Pause();
+        }
+        const osg::ref_ptr<osg::Node> scene = view.getSceneData();
+        view.setSceneData(nullptr);
+        if (values.viewer)
+            values.viewer->frame(DBL_MAX);
+        view.setSceneData(scene.get());
     }
-
-    const osg::ref_ptr<osg::Node> scene = view.getSceneData();
-    view.setSceneData(nullptr);
-    if (viewer)
-        viewer->frame(DBL_MAX);
-    view.setSceneData(scene.get());
-
     if (suspendIdle)
-    {
-        Tell(services.connectIdle);
-        EnableRendering(true);
-    }
+        Pause();
 }
 
 } // namespace
 
 void setViewerServices(VtTViewerServices newServices)
 {
-    services = std::move(newServices);
+    values.services = std::move(newServices);
 }
 
 void createViewer()
 {
-    if (viewer)
+    if (values.viewer)
         return;
 
     // The library tells of every file it tries at NOTICE.
     osg::setNotifyLevel(osg::WARN);
     PublishModuleDirectory();
 
-    viewer = new VtCOsgCompositeViewer;
-    osg::ref_ptr<VtCOsgViewerStats> stats = new VtCOsgViewerStats("Glide Panel");
-    stats->collectStats("frame_rate", true);
-    viewerStats = stats;
-    viewer->SetStats(*stats);
-    viewerReady = true;
+    values.viewer = new VtCOsgCompositeViewer;
+    values.stats = new osg::Stats("Glide Panel");
+    values.stats->collectStats("frame_rate", true);
+    values.viewer->setViewerStats(values.stats.get());
 }
 
 void destroyViewer()
 {
-    if (viewer)
+    if (values.viewer)
     {
-        if (viewer->areThreadsRunning())
-            viewer->stopThreading();
-        while (viewer->getNumViews() > 0)
+        if (values.viewer->areThreadsRunning())
+            values.viewer->stopThreading();
+        while (values.viewer->getNumViews() > 0)
         {
-            const osg::ref_ptr<osgViewer::View> view = viewer->getView(0);
+            const osg::ref_ptr<osgViewer::View> view = values.viewer->getView(0);
             view->setSceneData(nullptr);
-            viewer->removeView(view.get());
+            values.viewer->removeView(view.get());
         }
     }
-    viewer = nullptr;
-    viewerReady = false;
-    sharedContext = nullptr;
-    sharedContextWindow = nullptr;
+    values.viewer = nullptr;
+    values.sharedContext = nullptr;
+    values.sharedContextWindow = nullptr;
+}
+
+VtCViewerReady::operator bool() const
+{
+    return values.viewer.valid();
+}
+
+VtCRenderingGate& VtCRenderingGate::operator=(bool flag)
+{
+    if (flag)
+        own.reset();
+    else if (!own)
+        own.emplace(VtCFrameSuspension::Extent::pictures);
+    return *this;
+}
+
+osg::Stats* getViewerStats()
+{
+    return values.stats.get();
 }
 
 osgViewer::CompositeViewer* getViewer()
 {
-    return viewer.get();
+    return values.viewer.get();
 }
 
 void createSharedContext(host::Window& window)
 {
-    sharedContextWindow = &window;
+    values.sharedContextWindow = &window;
     const osg::ref_ptr<osg::GraphicsContext::Traits> traits = MakeTraits();
-    sharedContext =
-        services.graphics ? services.graphics->CreateContext({host::WindowKind::root, window, *traits}) : nullptr;
+    values.sharedContext = values.services.graphics
+                               ? values.services.graphics->CreateContext({host::WindowKind::root, window, *traits})
+                               : nullptr;
 }
 
 osg::GraphicsContext* getSharedContext()
 {
-    return sharedContext.get();
+    return values.sharedContext.get();
 }
 
 osg::ref_ptr<osg::GraphicsContext> createViewContext(host::ViewWindow& window)
 {
-    if (!services.graphics)
+    if (!values.services.graphics)
         return nullptr;
 
     const host::Rectangle client = window.GetClientRectangle();
     const osg::ref_ptr<osg::GraphicsContext::Traits> traits = MakeTraits();
     traits->width = client.width;
     traits->height = client.height;
-    traits->sharedContext = sharedContext.get();
-    return services.graphics->CreateContext({window.GetKind(), window, *traits});
+    traits->sharedContext = values.sharedContext.get();
+    return values.services.graphics->CreateContext({window.GetKind(), window, *traits});
 }
 
 osg::ref_ptr<osgViewer::View> createView(host::ViewWindow& window, const host::Rectangle& rectangle)
@@ -248,21 +252,21 @@ osg::ref_ptr<osgViewer::View> createView(host::ViewWindow& window, const host::R
 void addViewToViewer(osgViewer::View* view)
 {
     if (view && viewerReady)
-        viewer->AddView(*view);
+        values.viewer->AddView(*view);
 }
 
 void removeViewFromViewer(osgViewer::View* view)
 {
     if (view && viewerReady)
-        viewer->RemoveView(*view);
+        values.viewer->RemoveView(*view);
 }
 
 bool isViewInViewer(const osgViewer::View* view)
 {
-    if (!viewer)
+    if (!values.viewer)
         return false;
-    for (unsigned int index = 0; index < viewer->getNumViews(); ++index)
-        if (viewer->getView(index) == view)
+    for (unsigned int index = 0; index < values.viewer->getNumViews(); ++index)
+        if (values.viewer->getView(index) == view)
             return true;
     return false;
 }
@@ -270,13 +274,25 @@ bool isViewInViewer(const osgViewer::View* view)
 void RenderViewerFrame()
 {
     if (renderingEnabled && viewerReady)
-        viewer->frame(DBL_MAX); // the simulation time of the frame is the viewer's own clock, not that of the data
+        values.viewer->frame(
+            DBL_MAX); // the simulation time of the frame is the viewer's own clock, not that of the data
+}
+
+bool isViewerFrameDue()
+{
+    return renderingEnabled && viewerReady && values.viewer->checkNeedToDoFrame();
+}
+
+void requestViewerRedraw()
+{
+    if (values.viewer)
+        values.viewer->RequestRedraw();
 }
 
 void renderEmptyFrame(bool suspendIdle)
 {
-    osgViewer::View* view = Ask(services.activeView);
-    if (view && Ask(services.hasScene) && CardNeedsEmptyFrames())
+    osgViewer::View* view = Ask(values.services.activeView);
+    if (view && Ask(values.services.hasScene) && CardNeedsEmptyFrames())
         DrawWithoutScene(*view, suspendIdle);
 }
 
@@ -289,7 +305,7 @@ void renderEmptyFrameOfView(osgViewer::View* view, bool suspendIdle)
 double getFrameRate()
 {
     double value = 0.0;
-    if (viewerStats && !viewerStats->getAveragedAttribute("Frame rate", value, false))
+    if (values.stats && !values.stats->getAveragedAttribute("Frame rate", value, false))
         value = 0.0;
     return value;
 }
@@ -300,14 +316,19 @@ std::int32_t getVisiblePolygonCount(osgViewer::View* view, std::int32_t polygonC
     if (!stats)
         return polygonCount;
 
-    EnableRendering(false);
-    stats->collectStats("scene", true);
-    EnableRendering(true);
+    // Each change of what is collected stands between two pauses, with nothing drawn in the first.
+    const auto collect = [stats](bool flag)
+    {
+        {
+            const VtCFrameSuspension undrawn(VtCFrameSuspension::Extent::pictures);
+            Pause();
+            stats->collectStats("scene", flag);
+        }
+        Pause();
+    };
+    collect(true);
     RenderViewerFrame();
-    EnableRendering(false);
-
     const std::int32_t counted = SumPolygons(*stats);
-    stats->collectStats("scene", false);
-    EnableRendering(true);
+    collect(false);
     return counted;
 }

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string>
 
 #include <osg/GraphicsContext>
@@ -9,6 +10,7 @@
 #include <osg/Stats>
 #include <osgViewer/View>
 
+#include "base/FrameSuspension.h"
 #include "host/Graphics.h"
 
 namespace host
@@ -22,10 +24,12 @@ namespace osgViewer
 class CompositeViewer;
 } // namespace osgViewer
 
-/// The one viewer of the process: free functions over process-wide values, all on the thread that owns the windows.
+/// The one viewer of the process: free functions over one object that nobody else sees, all on the thread that owns the
+/// windows.
 ///
 /// Order of use: `setViewerServices` once; then for each document `createViewer`, `createSharedContext`, `createView`
-/// for each pane, `addViewToViewer`; `RenderViewerFrame` once a frame; `destroyViewer` with the document.
+/// for each pane, `addViewToViewer`; once an idle pass `RenderViewerFrame` if `isViewerFrameDue`; `destroyViewer` with
+/// the document.
 
 /// What the viewer needs from outside. Functions that are left empty count as "nothing" or "no".
 struct VtTViewerServices
@@ -36,8 +40,6 @@ struct VtTViewerServices
 
     std::function<bool()> multisampling;          ///< the host's multisampling setting
     std::function<std::string()> cardRenderer;    ///< the renderer string of the graphics card, empty until known
-    std::function<void()> disconnectIdle;         ///< suspends the idle cycle
-    std::function<void()> connectIdle;            ///< resumes it
     std::function<bool()> hasScene;               ///< does the application have a scene?
     std::function<osgViewer::View*()> activeView; ///< the view of the active pane, or null
 };
@@ -46,13 +48,29 @@ struct VtTViewerServices
 void setViewerServices(VtTViewerServices services);
 
 /// True from the end of `createViewer` to `destroyViewer`.
-extern bool viewerReady;
+class VtCViewerReady
+{
+public:
+    operator bool() const;
+};
+inline constexpr VtCViewerReady viewerReady;
 
-/// Gate of `RenderViewerFrame`. Whoever rebuilds the scene graph or changes views clears it before and sets it after.
-extern bool renderingEnabled;
+/// The gate of `RenderViewerFrame` by its name: true while no suspension holds the pictures up. False as a value holds
+/// one such suspension, and true gives that one up, not those of others. A stretch of code takes a suspension of its
+/// own instead.
+class VtCRenderingGate
+{
+public:
+    operator bool() const { return !VtCFrameSuspension::ArePicturesSuspended(); }
+    VtCRenderingGate& operator=(bool flag);
 
-/// The viewer's statistics, "Glide Panel"; null before the first `createViewer`.
-extern osg::ref_ptr<osg::Stats> viewerStats;
+private:
+    std::optional<VtCFrameSuspension> own;
+};
+extern VtCRenderingGate renderingEnabled;
+
+/// The viewer's statistics, "Glide Panel"; null before the first `createViewer`. Not owned.
+osg::Stats* getViewerStats();
 
 /// Does nothing while there is a viewer.
 void createViewer();
@@ -89,6 +107,14 @@ bool isViewInViewer(const osgViewer::View* view);
 /// Draws one frame of all views, if there is a viewer and rendering is enabled.
 void RenderViewerFrame();
 
+/// Would the next frame show something else than the last? The viewer sees by itself what moves, comes or goes in a
+/// scene, and what happens to cameras, panes and windows; input and animations count too. False while nothing can be
+/// drawn.
+bool isViewerFrameDue();
+
+/// Makes the next frame due: something has changed that the viewer doesn't see by itself, as a colour or a light.
+void requestViewerRedraw();
+
 /// Some drivers let go of a scene only when they have drawn without it: one frame of the active view with no scene,
 /// when a scene is present and the card is one of those. With `suspendIdle` the idle cycle rests meanwhile.
 void renderEmptyFrame(bool suspendIdle);
@@ -96,9 +122,10 @@ void renderEmptyFrame(bool suspendIdle);
 /// The same for the view of one pane; null does nothing.
 void renderEmptyFrameOfView(osgViewer::View* view, bool suspendIdle);
 
-/// Frames per second, averaged over the last 25; 0.0 before the first.
+/// Frames per second, averaged over the last 25; 0.0 before there were two in a row. A rest between two frames doesn't
+/// count, and while nothing is drawn the value stays.
 double getFrameRate();
 
 /// Polygons that one more frame finds in sight of `view`; `polygonCount`, the count before, when there is no view.
-/// Takes half a second of pauses, and leaves rendering enabled.
+/// Takes half a second of pauses. 0 while the pictures are suspended.
 std::int32_t getVisiblePolygonCount(osgViewer::View* view, std::int32_t polygonCount);

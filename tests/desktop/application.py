@@ -79,7 +79,7 @@ class Application:
             time.sleep(0.05)
 
     def wait_for_pictures(self) -> State:
-        state = self.wait(lambda s: s.get("views_created") and float(s["fps"] or 0) > 0, "views are drawn", 60)
+        state = self.wait(lambda s: s.get("views_created") and s["drawn_frames"] > 0, "views are drawn", 60)
         time.sleep(0.3)
         return state
 
@@ -103,6 +103,11 @@ class Application:
             if line.startswith("VmRSS"):
                 return int(line.split()[1]) * 1024
         raise RuntimeError("no VmRSS")
+
+    def cpu_seconds(self) -> float:
+        """Of all threads since the start."""
+        fields = Path(f"/proc/{self.process.pid}/stat").read_text().rpartition(")")[2].split()
+        return (int(fields[11]) + int(fields[12])) / os.sysconf("SC_CLK_TCK")
 
     def handles(self) -> int:
         return len(os.listdir(f"/proc/{self.process.pid}/fd"))

@@ -262,6 +262,27 @@ class WindowTest(unittest.TestCase):
         for number in range(1, 5):
             self.assertGreater(spread(self.pane_picture(number)), 20)
 
+    def test_a_stopped_window_draws_changes_and_what_was_covered_and_nothing_else(self) -> None:
+        self.start_example()
+        time.sleep(1)
+        drawn = self.application.state()["drawn_frames"]
+        time.sleep(1)
+        self.assertEqual(self.application.state()["drawn_frames"], drawn, "equal pictures are drawn")
+
+        before = self.pane_picture(2)
+        self.screen.key("Control_L+o")
+        self.application.wait(lambda s: s["dialogs"] and s["dialogs"][0]["has_keyboard"], "the file dialog is open")
+        time.sleep(0.3)
+        self.screen.key("Escape")
+        self.application.wait(lambda s: not s["dialogs"], "it has gone")
+        time.sleep(0.5)
+        for number in range(1, 5):
+            self.assertGreater(spread(self.pane_picture(number)), 20, f"pane {number} shows what covered it")
+        self.assertLess(differing(before, self.pane_picture(2)), 0.01)
+        self.application.click_action("38728")  # wire frame
+        time.sleep(0.5)
+        self.assertGreater(differing(before, self.pane_picture(2)), 0.1)
+
     def test_a_window_made_small_and_large_again_draws_on(self) -> None:
         state = self.start_example("--play")
         self.screen.resize(1, 1)

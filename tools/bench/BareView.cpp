@@ -1,11 +1,22 @@
 #include "tools/bench/BareView.h"
 
+#include <osg/GL>
 #include <osgViewer/View>
 
 #include "render/PanoramicView.h"
 
 namespace bench
 {
+
+namespace
+{
+
+struct Finish : osg::Camera::DrawCallback
+{
+    void operator()(osg::RenderInfo&) const override { glFinish(); }
+};
+
+} // namespace
 
 osg::ref_ptr<osgViewer::View> MakeBareView(VtCPanoramicView& pane, osg::Node* scene, osg::GraphicsContext* context)
 {
@@ -21,7 +32,13 @@ osg::ref_ptr<osgViewer::View> MakeBareView(VtCPanoramicView& pane, osg::Node* sc
     camera.setViewMatrix(model.getViewMatrix());
     view->setLightingMode(pane.getView()->getLightingMode());
     view->setSceneData(scene);
+    FinishFrames(*view);
     return view;
+}
+
+void FinishFrames(osgViewer::View& view)
+{
+    view.getCamera()->setFinalDrawCallback(new Finish);
 }
 
 } // namespace bench

@@ -20,4 +20,8 @@ namespace bench
 /// draws.
 osg::ref_ptr<osgViewer::View> MakeBareView(VtCPanoramicView& pane, osg::Node* scene, osg::GraphicsContext* context);
 
+/// Lets each frame of `view` end when its picture is finished: what is only handed to the driver would be paid for by
+/// whoever is measured next.
+void FinishFrames(osgViewer::View& view);
+
 } // namespace bench

@@ -15,7 +15,7 @@
 
 #include "host/ViewWindows.h"
 #include "hosts/common/ContextState.h"
-#include "render/SoftwareRenderer.h"
+#include "render/CompositeViewer.h"
 #include "tools/bench/BareView.h"
 #include "tools/bench/OpenExample.h"
 

@@ -127,10 +127,26 @@ def key_press(screen: Screen, home: Path) -> Pair:
     return statistics.median(waited), frame
 
 
+def window_at_rest(screen: Screen, home: Path) -> Pair:
+    """CPU seconds that the window takes while nothing runs or moves, and the seconds that pass."""
+    with window_on(screen, home) as window:
+        window.show_views()
+        window.wait_until_drawn()
+        time.sleep(2)
+        application = window.application
+        drawn, used, began = application.state()["drawn_frames"], application.cpu_seconds(), time.perf_counter()
+        time.sleep(10)
+        pair = application.cpu_seconds() - used, time.perf_counter() - began
+        if application.state()["drawn_frames"] > drawn:
+            raise RuntimeError("equal pictures are drawn")
+        return pair
+
+
 # row: (how it is measured, how often, what the subject is, what it is held against, the limit, whether it is a least)
 ROWS = {
     "window_frames": (window_frames, 3, "frames a second, example in four panes 480x300",
                       "bare Qt window and viewer, same views", 0.95, True),
+    "window_at_rest": (window_at_rest, 1, "CPU time of the stopped window", "time that passes", 0.03, False),
     "first_frame": (first_frame, 5, "start to first drawn frame of the example", "load and one picture by the command",
                     2.0, False),
     "key_press": (key_press, 3, "from the stop key to the play state, in replay", "one frame's time", 2.0, False),

@@ -152,17 +152,31 @@ TEST_F(Loop, ItSleepsOnlyWhenNobodyWantsTheNextEvent)
     EXPECT_EQ(clock.sleeps.size(), 2U);
 }
 
-TEST_F(Loop, AFailedHostCallIsShownAndEndsIt)
+TEST_F(Loop, AFailureIsShownOnceAndCostsOneEventOnly)
 {
     loop.Advise(first);
+    loop.Advise(second);
     first.action = [] { throw host::InterfaceError(-5, "MainWindow"); };
-    EXPECT_FALSE(loop.Run([] { return true; }));
+    EXPECT_FALSE(loop.Run([] { return true; })) << "a loop without a user ends";
     ASSERT_EQ(messages.shown.size(), 1U);
     EXPECT_EQ(messages.shown[0].number, hosts::messageInterfaceFailed);
     EXPECT_EQ(messages.shown[0].first, L"MainWindow");
     EXPECT_EQ(messages.shown[0].second, L"-5");
+
+    EXPECT_TRUE(loop.Raise()) << "the other sink has its events";
+    EXPECT_EQ(second.events, 2);
+    EXPECT_EQ(messages.shown.size(), 1U) << "no flood";
+    first.action = [] { throw std::runtime_error("another"); };
+    loop.Raise();
+    loop.Raise();
+    ASSERT_EQ(messages.shown.size(), 2U);
+    EXPECT_EQ(messages.shown[1].text, L"another");
     first.action = nullptr;
-    EXPECT_TRUE(loop.Raise()) << "the loop can be used again";
+    loop.Raise();
+    clock.Advance(61.0);
+    first.action = [] { throw std::runtime_error("another"); };
+    loop.Raise();
+    EXPECT_EQ(messages.shown.size(), 3U) << "it is new again";
 }
 
 struct Document : host::ManagedDocument

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "app/FrameCycle.h"
+#include "base/FrameSuspension.h"
 #include "tests/support/FakeHost.h"
 
 namespace
@@ -20,6 +21,7 @@ struct FakeWork : VtIFrameWork
     bool HasGraphicsSession() const override { return session; }
     bool IsSceneLoaded() const override { return scene; }
     void RenderCurrentView() override { calls += "observers "; }
+    bool IsFrameDue() override { return due; }
     void RenderViewerFrame() override { calls += "viewer "; }
     double GetFrameRate() const override { return frameRate; }
 
@@ -28,6 +30,7 @@ struct FakeWork : VtIFrameWork
     bool playing = false;
     bool session = true;
     bool scene = true;
+    bool due = true;
     std::int32_t stepResult = 1;
     double frameRate = 0.0;
     std::string calls;
@@ -272,13 +275,38 @@ TEST_F(FrameCycle, AnOperationMaySuspendItFromWithinItsOwnEvent)
     EXPECT_EQ(host.variables.idle.Raise(), 0);
 }
 
-TEST_F(FrameCycle, ARedrawOutsideOfThePassCanBeForbidden)
+TEST_F(FrameCycle, APictureThatWouldNotChangeIsDrawnOnlyWhenItIsAskedFor)
 {
+    work.due = false;
+    EXPECT_EQ(Pass(), "observers ");
     cycle.RedrawNow();
-    EXPECT_EQ(work.calls, "observers viewer ");
-    cycle.SetRedrawAllowed(false);
+    EXPECT_EQ(work.calls, "observers observers viewer ");
+    const VtCFrameSuspension undrawn(VtCFrameSuspension::Extent::pictures);
+    work.calls.clear();
     cycle.RedrawNow();
-    EXPECT_EQ(work.calls, "observers viewer ");
+    EXPECT_EQ(work.calls, "");
+}
+
+TEST_F(FrameCycle, NoInnerSuspensionEndsAnOuterOne)
+{
+    cycle.ConnectIdleSink();
+    const auto lives = [this] { return host.variables.idle.Raise() == 1; };
+    {
+        const VtCFrameSuspension outer;
+        {
+            const VtCFrameSuspension inner(VtCFrameSuspension::Extent::steps);
+            EXPECT_FALSE(lives());
+        }
+        EXPECT_FALSE(lives());
+        cycle.DisconnectIdleSink();
+        cycle.ConnectIdleSink();
+        EXPECT_FALSE(lives());
+        const VtCFrameSuspension undrawn(VtCFrameSuspension::Extent::pictures);
+        EXPECT_EQ(work.calls, "") << "no step, no picture";
+    }
+    EXPECT_TRUE(lives());
+    const VtCFrameSuspension undrawn(VtCFrameSuspension::Extent::pictures);
+    EXPECT_TRUE(lives()) << "data go on without pictures";
 }
 
 } // namespace

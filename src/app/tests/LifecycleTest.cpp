@@ -3,7 +3,6 @@
 #include <fstream>
 
 #include "app/GlidePanelToolBarEventsSink.h"
-#include "app/GraphicsSession.h"
 #include "base/Paths.h"
 #include "render/Viewer.h"
 #include "scene/Scene3D.h"

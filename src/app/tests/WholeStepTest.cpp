@@ -4,7 +4,8 @@
 
 #include "base/Text.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/OffscreenViews.h"
+#include "render/ChildFrame.h"
+#include "render/PanoramicView.h"
 #include "render/Viewer.h"
 #include "scene/MovableBody.h"
 #include "scene/Scene3D.h"
@@ -52,14 +53,9 @@ TEST_F(WholeStep, BodiesMoveBeforeTheObserversAndThePictureComesLast)
     hosts::EglGraphics graphics;
     host.graphics = &graphics;
     const VtC3DMovableBody& body = StartWithBody();
-    createViewer();
-    hosts::OffscreenWindow window(32, 32);
-    createSharedContext(window);
+    windows.Fire(); // makes the views
+    osgViewer::View* view = document->GetChildFrame()->getSplitter().getView(1)->getView();
     ASSERT_NE(getSharedContext(), nullptr) << base::Utf8(graphics.GetLastError());
-    const osg::ref_ptr<osgViewer::View> view = createView(window, window.GetClientRectangle());
-    view->setSceneData(document->GetScene()->GetRootNode());
-    addViewToViewer(view.get());
-    renderingEnabled = true;
 
     osg::ref_ptr<Witness> witness = new Witness(body);
     view->getCamera()->setPreDrawCallback(witness.get());
@@ -87,7 +83,7 @@ TEST_F(WholeStep, BodiesMoveBeforeTheObserversAndThePictureComesLast)
         << "restored, the data are where the clock is";
 
     document->GetScene()->SetObservers(nullptr);
-    removeViewFromViewer(view.get());
+    view->getCamera()->setPreDrawCallback(nullptr);
     Stop();
 }
 

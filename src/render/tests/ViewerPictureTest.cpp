@@ -34,13 +34,13 @@ TEST_F(ViewerPicture, ShowsLitBoxesWhereTheyStand)
 
 TEST_F(ViewerPicture, IsTheSameForTheSameSceneUnderANewRootContext)
 {
-    std::vector<osg::ref_ptr<osg::MatrixTransform>> moving;
-    const osg::ref_ptr<osg::Group> scene = scenes::Crowd(moving);
-    scenes::MoveCrowd(moving, 0);
+    const osg::ref_ptr<osg::Group> scene = scenes::Boxes();
+    scene->getOrCreateStateSet()->setAttributeAndModes(
+        scenes::Program("#version 120\nvoid main() { gl_FragColor = gl_Color; }"));
     const auto draw = [&]
     {
         osgViewer::View& view = AddView(scene, 320, 180);
-        LookAt(view, osg::Vec3d(0, -20, 10), osg::Vec3d());
+        LookAt(view, eye, osg::Vec3d());
         return Draw(view);
     };
     const osg::ref_ptr<osg::Image> first = draw();

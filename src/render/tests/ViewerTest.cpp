@@ -48,17 +48,34 @@ TEST_F(Viewer, DestroyedTakesTheSceneOutOfItsViews)
     EXPECT_TRUE(view.getCamera()->getGraphicsContext());
 }
 
-TEST_F(Viewer, DrawsNothingWhileRenderingIsHeldBack)
+TEST_F(Viewer, DrawsNothingUntilTheLastSuspensionEnds)
 {
     AddView(scenes::Boxes(), 64, 64);
-    RenderViewerFrame();
-    const unsigned int drawn = FrameNumber();
-    renderingEnabled = false;
-    RenderViewerFrame();
-    EXPECT_EQ(drawn, FrameNumber());
+    const auto draws = []
+    {
+        const unsigned int before = FrameNumber();
+        RenderViewerFrame();
+        return FrameNumber() > before;
+    };
+    EXPECT_TRUE(draws());
+    {
+        const VtCFrameSuspension outer;
+        {
+            const VtCFrameSuspension inner(VtCFrameSuspension::Extent::pictures);
+        }
+        EXPECT_FALSE(draws());
+        renderingEnabled = true;
+        EXPECT_FALSE(renderingEnabled) << "the name doesn't end what others hold";
+        EXPECT_FALSE(draws());
+        renderingEnabled = false;
+        renderingEnabled = false;
+    }
+    EXPECT_FALSE(draws()) << "nor do others end what the name holds";
+    EXPECT_FALSE(isViewerFrameDue());
     renderingEnabled = true;
-    RenderViewerFrame();
-    EXPECT_EQ(drawn + 1, FrameNumber());
+    EXPECT_TRUE(draws());
+    const VtCFrameSuspension steps(VtCFrameSuspension::Extent::steps);
+    EXPECT_TRUE(draws());
 }
 
 // Angles by hand: 80 degrees across a landscape window make 80/aspect upright.
@@ -189,30 +206,39 @@ const EmptyFrame emptyFrames[] = {
     {"no active view", "GeForce 8400", true, false, false},
 };
 
+/// Tells whether the cycle was suspended when the picture was drawn.
+struct Witness : osg::Camera::DrawCallback
+{
+    void operator()(osg::RenderInfo&) const override
+    {
+        told = VtCFrameSuspension::AreStepsSuspended() && !renderingEnabled ? "suspended" : "live";
+    }
+    mutable std::string told;
+};
+
 TEST_F(Viewer, DrawsAnEmptyFrameOnlyForCardsThatNeedIt)
 {
     const osg::ref_ptr<osg::Group> scene = scenes::Boxes();
     osgViewer::View& view = AddView(scene, 64, 64);
     RenderViewerFrame();
-    std::string told;
+    const osg::ref_ptr<Witness> witness = new Witness;
+    view.getCamera()->setFinalDrawCallback(witness);
     for (const EmptyFrame& empty : emptyFrames)
     {
         SCOPED_TRACE(empty.name);
         services.cardRenderer = [&] { return std::string(empty.card); };
         services.hasScene = [&] { return empty.scene; };
         services.activeView = [&] { return empty.active ? &view : nullptr; };
-        services.disconnectIdle = [&] { told += renderingEnabled ? "d" : "!"; };
-        services.connectIdle = [&] { told += renderingEnabled ? "!" : "c"; };
         setViewerServices(services);
 
         for (const bool suspend : {true, false})
         {
-            told.clear();
+            witness->told.clear();
             clock.sleeps.clear();
             const unsigned int before = FrameNumber();
             renderEmptyFrame(suspend);
             EXPECT_EQ(before + (empty.drawn ? 1 : 0), FrameNumber());
-            EXPECT_EQ(empty.drawn && suspend ? "dc" : "", told);
+            EXPECT_EQ(!empty.drawn ? "" : suspend ? "suspended" : "live", witness->told);
             EXPECT_EQ(empty.drawn && suspend ? std::vector<std::uint32_t>(2, 100) : std::vector<std::uint32_t>(),
                       clock.sleeps);
             EXPECT_EQ(scene.get(), view.getSceneData());

@@ -55,7 +55,7 @@ protected:
     void Open()
     {
         frame = std::make_unique<VtCChildFrame>(
-            VtTChildFrameServices{document, *observers, *this, mouse, windows, selection, clock, nullptr, nullptr});
+            VtTChildFrameServices{document, *observers, *this, mouse, windows, selection, clock});
     }
 
     void CreateViews()
