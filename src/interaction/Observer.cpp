@@ -53,7 +53,13 @@ osg::Quat RotationFromRecord(const VtTFloatTupel3& angles)
 VtTFloatTupel3 RecordFromCameraRotation(const osg::Quat& cameraRotation)
 {
     const osg::Vec3f angles = EulerAngles(cameraRotation);
-    return {angles.y(), 90.0f - angles.x(), angles.z() + 90.0f};
+    return {angles.y() + 0.0f, 90.0f - angles.x(), angles.z() + 90.0f}; // no "-0" in the file
+}
+
+// The rotation of the free view that has a camera of this rotation.
+osg::Quat OrientationFromCamera(const osg::Quat& cameraRotation)
+{
+    return osg::Quat(quarterTurn, xAxis) * cameraRotation * osg::Quat(-quarterTurn, xAxis);
 }
 
 // From the rotation of the free view, against which the camera is turned by a quarter.
@@ -228,6 +234,7 @@ void VtC3DObserver::Place(const Placement& placement)
     const osg::Vec3f angles(offsetAngles.x(), offsetAngles.y(), followMode == followLookAt ? 0.0f : offsetAngles.z());
     const osg::Quat camera = CameraAxes(angles) * placement.rotation;
     position = placement.position;
+    placedByRule = true;
     osg::Matrixd view = osg::Matrixd::rotate(camera.conj());
     view.preMultTranslate(-osg::Vec3d(position));
     setMatrix(view, true);
@@ -291,6 +298,7 @@ void VtC3DObserver::RebuildFreeView(bool update)
     const osg::Matrixd axes(1, 0, 0, 0, 0, 0, -1, 0, 0, 1, 0, 0, 0, 0, 0, 1);
     const osg::Matrixd camera = axes * osg::Matrixd::rotate(orientation) * osg::Matrixd::rotate(quarterTurn, xAxis) *
                                 osg::Matrixd::translate(position);
+    placedByRule = false;
     setMatrix(osg::Matrixd::inverse(camera), update);
 }
 
@@ -304,7 +312,7 @@ void VtC3DObserver::setMatrix(const osg::Matrixd& matrix, bool update)
 void VtC3DObserver::StoreFreeView(const osg::Vec3f& eye, const osg::Quat& cameraRotation)
 {
     position = eye;
-    orientation = osg::Quat(quarterTurn, xAxis) * cameraRotation * osg::Quat(-quarterTurn, xAxis);
+    orientation = OrientationFromCamera(cameraRotation);
     RebuildFreeView(false);
     WriteAttribute(attribute::position, TupelOf(eye));
     WriteAttribute(attribute::orientation, RecordFromCameraRotation(cameraRotation));
@@ -344,6 +352,8 @@ void VtC3DObserver::TakeName(const std::wstring& name)
 {
     SetDisplayName(name);
     SetObjectName(name);
+    if (assigned) // the records of views hold the name
+        collection.GetInteraction().ReplaceObserverInViews(*this, *this);
 }
 
 void VtC3DObserver::SetFollowMode(const std::wstring& name)
@@ -363,6 +373,13 @@ void VtC3DObserver::ChangeFollowMode(std::int32_t index, const std::wstring& nam
 {
     followMode = index;
     followModeName = name;
+    if (!IsFree() || !placedByRule)
+        return;
+    // It stays where the rule has left it, and that is its placement from now on.
+    orientation = OrientationFromCamera(viewMatrix.getRotate().conj());
+    placedByRule = false;
+    WriteBack(attribute::position);
+    WriteBack(attribute::orientation);
 }
 
 void VtC3DObserver::SetConnectedBody(VtC3DMovableBody* body)
@@ -379,6 +396,23 @@ void VtC3DObserver::HoldBody(VtC3DMovableBody* body)
         connectedBody->Release();
     connectedBody = body;
     connectedBodyName.clear();
+    connectedName.Follow(body ? body->GetAttributeObject().get() : nullptr);
+}
+
+void VtC3DObserver::BodyName::Follow(VtISceneObject* newRecord)
+{
+    if (record)
+        record->Unadvise(*this);
+    record = newRecord;
+    if (record)
+        record->Advise(*this);
+}
+
+void VtC3DObserver::BodyName::OnPropertyChanged(VtISceneObject&, VtISceneAttribute& attribute)
+{
+    // The body hears it first, for it listened first.
+    if (attribute.GetName() == attribute::name)
+        observer.WriteBack(attribute::attachedTo);
 }
 
 void VtC3DObserver::SetTranslationOffset(const osg::Vec3f& offset)

@@ -115,6 +115,7 @@ public:
     }
 
     void ApplyAttributes(VtISceneObject& source) override;
+
     /// What the record of a free observer (type 9), or of any other, holds. Names in any case.
     static const VtCAttributeTable& Attributes(bool freeByBirth);
     const VtCAttributeTable& GetAttributeTable() const override { return Attributes(isFreeByBirth); }
@@ -131,6 +132,22 @@ private:
     {
         osg::Vec3f position;
         osg::Quat rotation;
+    };
+
+    /// Hears when the body gets another name, which the record of the observer holds.
+    class BodyName : public IPropertyChangedCOMEvents
+    {
+    public:
+        explicit BodyName(VtC3DObserver& rider) : observer(rider) {}
+        ~BodyName() override { Follow(nullptr); }
+
+        /// Listens to `newRecord` and to nothing else.
+        void Follow(VtISceneObject* newRecord);
+        void OnPropertyChanged(VtISceneObject& object, VtISceneAttribute& attribute) override;
+
+    private:
+        VtC3DObserver& observer;
+        osg::ref_ptr<VtISceneObject> record;
     };
 
     static VtTAttributeRows Rows(bool freeByBirth);
@@ -164,10 +181,12 @@ private:
     osg::Quat offsetRotation;
     osg::Quat orientation;
     osg::Matrixd viewMatrix;
+    bool placedByRule = false; ///< else by `position` and `orientation`
     std::vector<osg::Camera*> cameras;
     std::int32_t followMode = followFixed;
     std::wstring followModeName;
     VtC3DMovableBody* connectedBody = nullptr; ///< one reference
-    std::wstring connectedBodyName;            ///< of a body that the scene doesn't hold
+    BodyName connectedName{*this};
+    std::wstring connectedBodyName; ///< of a body that the scene doesn't hold
     VtCSmoothFollower follower;
 };

@@ -94,7 +94,8 @@ void VtCBase3DView::assignObserver(VtC3DObserver* newObserver)
 {
     if (!newObserver)
         return;
-    newObserver->AddRef(); // a removed observer lives on until no view looks through it
+    const bool isAnother = newObserver != observer; // the same one may have another name
+    newObserver->AddRef();                          // a removed observer lives on until no view looks through it
     if (observer)
     {
         if (frame.GetObservers() && frame.countViewsOfObserver(*observer) < 2)
@@ -113,7 +114,8 @@ void VtCBase3DView::assignObserver(VtC3DObserver* newObserver)
         observer->PushViewMatrix();
     }
     valueChanged(attribute::observer);
-    frame.ObserverAssigned(*this);
+    if (isAnother)
+        frame.ObserverAssigned(*this);
 }
 
 VtCOsgCameramanipulator* VtCBase3DView::GetManipulator() const

@@ -385,6 +385,16 @@ TEST_F(Attributes, WhatIsWrittenWhileTheObjectWritesIsHeardToo)
     ExpectAgreement();
 }
 
+TEST_F(Attributes, RecordsThatNameAnotherObjectFollowItsName)
+{
+    observer->SetConnectedBody(movable);
+    View().assignObserver(observer);
+    movable->GetAttributeObject()->Write(attribute::name, std::wstring(L"Front"));
+    observer->SetName(L"Over the front");
+    EXPECT_EQ(*observer->GetAttributeObject()->Find<std::wstring>(attribute::attachedTo), L"Front");
+    EXPECT_EQ(*View().getSceneObject()->Find<std::wstring>(attribute::observer), L"Over the front");
+}
+
 TEST_F(Attributes, ATransparencyWaitsWhileTheSceneHasAMode)
 {
     VtCScene3D& scene = *document->GetScene();
@@ -470,11 +480,13 @@ TEST_F(Attributes, ASceneComesBackWholeInWhateverOrderItsAttributesStand)
     const std::string first = Content(folder.path / "first.xml");
     EXPECT_NE(first.find("of_a_later_version"), std::string::npos);
 
-    for (const std::string& text : {first, Reversed(first)})
+    // A record that an object had before the file came keeps its own place, so the bytes are those of a loaded scene.
+    std::string saved;
+    for (const std::string& text : {first, Reversed(first), std::string()})
     {
         host.documentManager.CloseActiveDocument();
         document = dynamic_cast<VtCPanoramicDocument*>(
-            host.documentManager.OpenDocument(base::InnerPath(folder.Write("again.xml", text))));
+            host.documentManager.OpenDocument(base::InnerPath(folder.Write("again.xml", text.empty() ? saved : text))));
         ASSERT_TRUE(document);
         windows.Fire();
         movable = document->GetScene()->FindMovableByName(L"Follower");
@@ -483,10 +495,10 @@ TEST_F(Attributes, ASceneComesBackWholeInWhateverOrderItsAttributesStand)
         ASSERT_TRUE(movable && fixed && observer);
         EXPECT_FALSE(document->IsModified());
         ExpectAgreement();
-        const std::map<std::wstring, std::wstring> read = ValuesOf(Subjects());
-        EXPECT_EQ(read, stored);
-        ASSERT_TRUE(document->OnSaveDocument(base::InnerPath(folder.path / "second.xml")));
-        EXPECT_EQ(Content(folder.path / "second.xml"), text);
+        EXPECT_EQ(ValuesOf(Subjects()), stored);
+        ASSERT_TRUE(document->OnSaveDocument(base::InnerPath(folder.path / "saved.xml")));
+        EXPECT_TRUE(!text.empty() || Content(folder.path / "saved.xml") == saved);
+        saved = Content(folder.path / "saved.xml");
     }
 }
 
