@@ -11,7 +11,7 @@
 #include <QTabWidget>
 #include <QVBoxLayout>
 
-#include "simdata/points/PropertyPage.h"
+#include "simdata/points/SettingsPage.h"
 
 namespace desktop
 {
@@ -19,17 +19,17 @@ namespace desktop
 namespace
 {
 
-using SimulationDataPoints::VtCPropertyPage;
-using SimulationDataPoints::VtTPropertyField;
+using SimulationDataPoints::VtCSettingsPage;
+using SimulationDataPoints::VtTSettingsField;
 
 /// A form over one page: what the user changes goes to the page, and the page says what there is to show.
 class PageForm : public QWidget
 {
 public:
-    PageForm(VtCPropertyPage& shownPage, QWidget* parent) : QWidget(parent), page(shownPage)
+    PageForm(VtCSettingsPage& shownPage, QWidget* parent) : QWidget(parent), page(shownPage)
     {
         auto* form = new QFormLayout(this);
-        const std::vector<VtTPropertyField> fields = page.GetFields();
+        const std::vector<VtTSettingsField> fields = page.GetFields();
         for (std::size_t i = 0; i < fields.size(); ++i)
         {
             Row row;
@@ -51,12 +51,13 @@ private:
         QLabel* label = nullptr;
     };
 
-    QDoubleSpinBox* MakeEdit(std::size_t index, const VtTPropertyField& field)
+    QDoubleSpinBox* MakeEdit(std::size_t index, const VtTSettingsField& field)
     {
         auto* edit = new QDoubleSpinBox(this);
         edit->setDecimals(field.decimals);
         edit->setRange(field.minimum, field.maximum);
         edit->setSingleStep(field.step);
+        edit->setSpecialValueText(QString::fromStdWString(field.minimumText));
         QObject::connect(edit, &QDoubleSpinBox::valueChanged, this,
                          [this, index](double value)
                          {
@@ -68,7 +69,7 @@ private:
 
     void ShowFields()
     {
-        const std::vector<VtTPropertyField> fields = page.GetFields();
+        const std::vector<VtTSettingsField> fields = page.GetFields();
         for (std::size_t i = 0; i < rows.size(); ++i)
             if (rows[i].edit)
             {
@@ -79,19 +80,19 @@ private:
                 rows[i].label->setText(QLocale().toString(fields[i].value, 'f', fields[i].decimals));
     }
 
-    VtCPropertyPage& page;
+    VtCSettingsPage& page;
     std::vector<Row> rows;
 };
 
 } // namespace
 
-bool PropertySheets::ShowPropertySheet(const std::wstring& title, const std::vector<VtCPropertyPage*>& pages,
+bool PropertySheets::ShowPropertySheet(const std::wstring& title, const std::vector<VtCSettingsPage*>& pages,
                                        std::size_t start)
 {
     QDialog dialog(QApplication::activeWindow());
     dialog.setWindowTitle(QString::fromStdWString(title));
     auto* tabs = new QTabWidget(&dialog);
-    for (VtCPropertyPage* page : pages)
+    for (VtCSettingsPage* page : pages)
         tabs->addTab(new PageForm(*page, tabs), QString::fromStdWString(page->GetTitle()));
     tabs->setCurrentIndex(static_cast<int>(start));
     auto* buttons = new QDialogButtonBox(QDialogButtonBox::Ok | QDialogButtonBox::Cancel, &dialog);

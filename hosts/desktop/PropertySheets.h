@@ -9,7 +9,7 @@ namespace desktop
 class PropertySheets : public host::PropertySheets
 {
 public:
-    bool ShowPropertySheet(const std::wstring& title, const std::vector<SimulationDataPoints::VtCPropertyPage*>& pages,
+    bool ShowPropertySheet(const std::wstring& title, const std::vector<SimulationDataPoints::VtCSettingsPage*>& pages,
                            std::size_t start) override;
 };
 

@@ -39,7 +39,7 @@ std::optional<OffSimOptions> OffSimOptions::Parse(const std::wstring& text, std:
 {
     OffSimOptions options;
     std::set<std::wstring> taken;
-    for (const std::wstring& field : base::Split(text, L';'))
+    for (const std::wstring& field : base::Split(base::Replace(text, L",", L";"), L';'))
     {
         const std::string all = base::Utf8(field);
         const std::string_view stripped = base::Trim(all);

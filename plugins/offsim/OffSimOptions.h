@@ -25,9 +25,9 @@ struct OffSimOptions
     bool CanOpen() const { return !fail || *fail > 0.0 || recover; }
     bool FailsAt(double time) const { return fail && time >= *fail && !(recover && time >= *recover); }
 
-    /// The options that `text` holds, the others as they are by default. Keys without regard to case; blanks around
-    /// keys and values and empty fields mean nothing. Nothing, and the reason in `fault`, for an unknown key, one that
-    /// stands twice, or a value out of range.
+    /// The options that `text` holds, with ";" or "," between them, the others as they are by default. Keys without
+    /// regard to case; blanks around keys and values and empty fields mean nothing. Nothing, and the reason in `fault`,
+    /// for an unknown key, one that stands twice, or a value out of range.
     static std::optional<OffSimOptions> Parse(const std::wstring& text, std::wstring& fault);
 
     /// A text that parses to the same options. Never empty: the seed always stands in it.

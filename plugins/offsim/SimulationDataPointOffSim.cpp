@@ -2,10 +2,13 @@
 
 #include <algorithm>
 #include <cmath>
+#include <new>
 
 #include "base/Numbers.h"
 #include "base/Text.h"
 #include "offsim/OffSimRun.h"
+#include "simdata/points/ExportFactory.h"
+#include "simdata/points/SettingsPage.h"
 
 namespace SimulationDataPoints
 {
@@ -36,6 +39,79 @@ double TimeOf(std::int64_t step)
 {
     return static_cast<double>(step) / OffSimRun::stepsPerSecond;
 }
+
+/// The options of a point. The failure stands there with its length and not with its end, so that no two fields can
+/// contradict each other.
+class OptionsPage : public VtCSettingsPage
+{
+public:
+    explicit OptionsPage(VtCSimulationDataPoint& owner, const offsim::OffSimOptions& options)
+        : point(owner),
+          seed(options.seed),
+          fail(options.fail.value_or(never)),
+          length(options.recover ? *options.recover - *options.fail : forGood)
+    {
+    }
+
+    std::wstring GetTitle() const override { return point.GetName(); }
+
+    std::vector<VtTSettingsField> GetFields() const override
+    {
+        return {{.label = L"Seed of the side wind",
+                 .value = static_cast<double>(seed),
+                 .editable = true,
+                 .maximum = 999'999'999.0},
+                {.label = L"The source fails at (s)",
+                 .value = fail,
+                 .editable = true,
+                 .minimum = never,
+                 .maximum = longest,
+                 .decimals = 2,
+                 .minimumText = L"never"},
+                {.label = L"The failure lasts (s)",
+                 .value = length,
+                 .editable = true,
+                 .minimum = forGood,
+                 .maximum = longest,
+                 .decimals = 2,
+                 .minimumText = L"for good"}};
+    }
+
+    void OnFieldChanged(std::size_t field, double value) override
+    {
+        if (field == 0 && value >= 0.0)
+            seed = static_cast<std::uint64_t>(value);
+        else if (field == 1)
+            fail = value;
+        else if (field == 2)
+            length = value;
+    }
+
+    void OnOK() override
+    {
+        offsim::OffSimOptions options;
+        options.seed = seed;
+        if (fail >= 0.0)
+            options.fail = fail;
+        if (options.fail && length > forGood)
+            options.recover = VtCSimulationDataFrame::RoundTimeStamp(fail + length);
+        // A run that goes on, and one that is recorded, don't end for a page that was only looked at.
+        std::wstring present;
+        point.GetSourcePath(present);
+        if (options.Text() != present)
+            point.Configure(sourceType, options.Text(), 1, 0);
+    }
+
+private:
+    static constexpr double never = -1.0;
+    static constexpr double forGood = 0.0;
+    static constexpr double longest = 1'000'000.0;
+
+    VtCSimulationDataPoint& point;
+    std::uint64_t seed;
+    double fail;
+    double length;
+};
 
 } // namespace
 
@@ -75,6 +151,11 @@ int VtCSimulationDataPointOffSim::Configure(const std::wstring& type, const std:
     Disconnect();
     options = *parsed;
     return 1;
+}
+
+VtCSettingsPage* VtCSimulationDataPointOffSim::CreatePropertyPage()
+{
+    return new OptionsPage(*this, options);
 }
 
 void VtCSimulationDataPointOffSim::Reset()
@@ -189,3 +270,8 @@ void VtCSimulationDataPointOffSim::ReportFailure(const std::wstring& what)
 }
 
 } // namespace SimulationDataPoints
+
+SIMULATION_DATA_POINT_FACTORY
+{
+    return new (std::nothrow) SimulationDataPoints::VtCSimulationDataPointOffSim;
+}

@@ -51,6 +51,9 @@ public:
     int CanPreload() const override { return 1; }
     int FetchOnce() override;
     VtCSimulationDataFrame* GetCurrentFrame(unsigned long& frame) override;
+
+    /// The options, to be changed; must go before the point.
+    VtCSettingsPage* CreatePropertyPage() override;
     void OnDeselect() override { Disconnect(); }
     int IsTimeDriven() const override { return 1; }
     void Reset() override;

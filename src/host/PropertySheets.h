@@ -6,7 +6,7 @@
 
 namespace SimulationDataPoints
 {
-class VtCPropertyPage;
+class VtCSettingsPage;
 }
 
 namespace host
@@ -21,7 +21,7 @@ public:
     /// Shows `pages` (not owned, at least one) under `title`, opened on the page with the index `start`, and returns
     /// when the user is done. True for OK: the caller then tells the pages so. The idle events go on meanwhile.
     virtual bool ShowPropertySheet(const std::wstring& title,
-                                   const std::vector<SimulationDataPoints::VtCPropertyPage*>& pages,
+                                   const std::vector<SimulationDataPoints::VtCSettingsPage*>& pages,
                                    std::size_t start) = 0;
 };
 

@@ -10,16 +10,11 @@
 #include "base/Text.h"
 #include "simdata/points/ExportFactory.h"
 
+using SimulationDataPoints::dataPointKinds;
 using SimulationDataPoints::VtCSimulationDataPoint;
 
 namespace
 {
-
-/// In the order of the kind numbers.
-constexpr const wchar_t* moduleNames[] = {
-    L"SimulationDataPointFileU",  L"SimulationDataPointHardwareU", L"SimulationDataPointNetworkU",
-    L"SimulationDataPointSmartU", L"SimulationDataPointOffSimU",   L"SimulationDataPointNetConnectionU",
-};
 
 std::wstring LastLoaderError()
 {
@@ -37,7 +32,8 @@ void VtCDataPointDeleter::operator()(VtCSimulationDataPoint* point) const
 
 std::wstring VtCDataPointPlugins::GetModuleName(VtEDataPointKind kind)
 {
-    return std::wstring(moduleNames[static_cast<std::size_t>(kind) - 1]) + L".so";
+    const auto* row = std::ranges::find(dataPointKinds, kind, &SimulationDataPoints::VtTDataPointKind::number);
+    return L"SimulationDataPoint" + std::wstring(row->name) + L"U.so";
 }
 
 bool VtCDataPointPlugins::Load(VtEDataPointKind kind)
@@ -59,7 +55,7 @@ bool VtCDataPointPlugins::Load(VtEDataPointKind kind)
         if (void* handle = dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL))
             module.handle = std::shared_ptr<void>(handle, dlclose);
         else
-            AddFault(kind, module.path, LastLoaderError());
+            AddFault(kind, LastLoaderError());
         break;
     }
     return module.handle != nullptr;
@@ -74,7 +70,18 @@ VtTDataPointPtr VtCDataPointPlugins::MakePoint(VtEDataPointKind kind)
     void* symbol = dlsym(module.handle.get(), SimulationDataPoints::factoryName);
     if (!symbol)
     {
-        AddFault(kind, module.path, LastLoaderError());
+        AddFault(kind, LastLoaderError());
+        return nullptr;
+    }
+    const auto version = reinterpret_cast<SimulationDataPoints::VersionFunction>(
+        dlsym(module.handle.get(), SimulationDataPoints::versionName));
+    if (!version || version() != SimulationDataPoints::interfaceVersion)
+    {
+        AddFault(kind,
+                 L"it was built with " + (version ? L"version " + std::to_wstring(version()) : L"no version") +
+                     L" of the data point interface, and this program has version " +
+                     std::to_wstring(SimulationDataPoints::interfaceVersion),
+                 true);
         return nullptr;
     }
     std::wstring reason = L"its factory gave no data point";
@@ -95,23 +102,25 @@ VtTDataPointPtr VtCDataPointPlugins::MakePoint(VtEDataPointKind kind)
     {
         reason = L"its factory failed";
     }
-    AddFault(kind, module.path, std::move(reason));
+    AddFault(kind, std::move(reason));
     return nullptr;
 }
 
 void VtCDataPointPlugins::Unload()
 {
-    using enum VtEDataPointKind;
-    for (const VtEDataPointKind kind : {File, Hardware, NetConnection, Network, Smart, OffSim})
-        ModuleOf(kind) = {};
+    auto leaving = std::to_array(dataPointKinds);
+    std::ranges::sort(leaving, {}, &SimulationDataPoints::VtTDataPointKind::unloaded);
+    for (const auto& kind : leaving)
+        ModuleOf(kind.number) = {};
     faults.clear();
 }
 
-void VtCDataPointPlugins::AddFault(VtEDataPointKind kind, const std::wstring& path, std::wstring reason)
+void VtCDataPointPlugins::AddFault(VtEDataPointKind kind, std::wstring reason, bool otherVersion)
 {
     // A module that gives no point is asked again for every file that is written: once is enough to tell.
+    const std::wstring& path = ModuleOf(kind).path;
     const bool known = std::any_of(faults.begin(), faults.end(),
                                    [&](const VtTPluginFault& f) { return f.path == path && f.reason == reason; });
     if (!known)
-        faults.push_back({GetModuleName(kind), path, std::move(reason)});
+        faults.push_back({GetModuleName(kind), path, std::move(reason), otherVersion});
 }

@@ -1,10 +1,12 @@
 #pragma once
 
 #include <array>
+#include <iterator>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "simdata/points/DataPointKinds.h"
 #include "simdata/points/SimulationDataPoint.h"
 
 /// Ends a data point as it wants it (`Release`, then deletion) and keeps the module with its code loaded until then.
@@ -17,16 +19,7 @@ struct VtCDataPointDeleter
 
 using VtTDataPointPtr = std::unique_ptr<SimulationDataPoints::VtCSimulationDataPoint, VtCDataPointDeleter>;
 
-/// The kinds of data points, by number; each has a module of its own.
-enum class VtEDataPointKind : int
-{
-    File = 1,
-    Hardware = 2,
-    Network = 3,
-    Smart = 4,
-    OffSim = 5,
-    NetConnection = 6,
-};
+using SimulationDataPoints::VtEDataPointKind;
 
 /// A module that is there and gave no data point.
 struct VtTPluginFault
@@ -34,6 +27,7 @@ struct VtTPluginFault
     std::wstring module;
     std::wstring path; ///< inner form
     std::wstring reason;
+    bool otherVersion = false; ///< built with another version of the interface
 };
 
 /// The modules that data points come from, one for each kind.
@@ -49,7 +43,8 @@ public:
     /// Loads the module of `kind`, unless it is loaded. False when there is none, or it isn't a library.
     bool Load(VtEDataPointKind kind);
 
-    /// A new point of `kind`; null when its module isn't loaded or gives none.
+    /// A new point of `kind`; null when its module isn't loaded, gives none, or was built with another version of the
+    /// interface.
     VtTDataPointPtr MakePoint(VtEDataPointKind kind);
 
     /// Lets go of all modules, and of the faults. A module stays loaded as long as a point of it lives.
@@ -68,9 +63,9 @@ private:
     };
 
     Module& ModuleOf(VtEDataPointKind kind) { return modules[static_cast<std::size_t>(kind) - 1]; }
-    void AddFault(VtEDataPointKind kind, const std::wstring& path, std::wstring reason);
+    void AddFault(VtEDataPointKind kind, std::wstring reason, bool otherVersion = false);
 
     std::vector<std::wstring> folders;
-    std::array<Module, 6> modules;
+    std::array<Module, std::size(SimulationDataPoints::dataPointKinds)> modules; ///< by number, less 1
     std::vector<VtTPluginFault> faults;
 };

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <utility>
 
+#include "base/Paths.h"
 #include "base/Text.h"
 #include "host/Frame.h"
 #include "host/Messages.h"
@@ -17,6 +18,7 @@ namespace
 {
 
 constexpr std::uint32_t messageNoDataPoint = 303;
+constexpr std::uint32_t messageOtherVersion = 9032; ///< %1: the module, %2: the reason
 
 /// The host's cursor says "wait" as long as this stands.
 class WaitCursor
@@ -56,10 +58,13 @@ VtCSimulationDataRouter::~VtCSimulationDataRouter()
 
 void VtCSimulationDataRouter::LoadPlugins()
 {
-    using enum VtEDataPointKind;
     UnloadPlugins();
-    for (const VtEDataPointKind kind : {File, Network, OffSim, Hardware, NetConnection, Smart})
-        LoadPlugin(kind);
+    for (const SimulationDataPoints::VtTDataPointKind& kind : SimulationDataPoints::dataPointKinds)
+        LoadPlugin(kind.number);
+    for (const VtTPluginFault& fault : plugins.GetFaults())
+        if (fault.otherVersion)
+            services.messages.ShowWarning(messageOtherVersion, base::Wide(base::NativePath(fault.path).string()),
+                                          fault.reason);
     if (allPoints.empty())
         services.messages.ShowError(messageNoDataPoint);
     changeObjects.ForEach([](VtCSimulationDataChangeObject& listener) { listener.OnDataPointsChanged(1); });

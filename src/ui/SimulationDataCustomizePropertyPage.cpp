@@ -47,7 +47,7 @@ std::wstring VtCSimulationDataCustomizePropertyPage::GetTitle() const
     return texts.GetText(textPageTitle);
 }
 
-std::vector<SimulationDataPoints::VtTPropertyField> VtCSimulationDataCustomizePropertyPage::GetFields() const
+std::vector<SimulationDataPoints::VtTSettingsField> VtCSimulationDataCustomizePropertyPage::GetFields() const
 {
     return {{.label = texts.GetText(textSimulationFrames),
              .value = static_cast<double>(simulationFrames),

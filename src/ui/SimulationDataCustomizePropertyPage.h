@@ -2,7 +2,7 @@
 
 #include <cstdint>
 
-#include "simdata/points/PropertyPage.h"
+#include "simdata/points/SettingsPage.h"
 
 namespace host
 {
@@ -14,7 +14,7 @@ class VtCSimulationDataController;
 
 /// The controller's own page: how many of the buffered frames go to the data points, and how many are left for the
 /// tracks. The two share a total that stays.
-class VtCSimulationDataCustomizePropertyPage : public SimulationDataPoints::VtCPropertyPage
+class VtCSimulationDataCustomizePropertyPage : public SimulationDataPoints::VtCSettingsPage
 {
 public:
     /// `messageService` null: nobody is told that the sizes take effect later. `framesOfTracks`: what the tracks hold
@@ -32,7 +32,7 @@ public:
     std::int32_t GetMaximum() const { return maximum; }
 
     std::wstring GetTitle() const override;
-    std::vector<SimulationDataPoints::VtTPropertyField> GetFields() const override;
+    std::vector<SimulationDataPoints::VtTSettingsField> GetFields() const override;
     void OnFieldChanged(std::size_t field, double value) override;
     void OnOK() override;
 

@@ -7,11 +7,11 @@
 #include "host/Messages.h"
 #include "host/PropertySheets.h"
 #include "host/Questions.h"
-#include "simdata/points/PropertyPage.h"
+#include "simdata/points/SettingsPage.h"
 #include "simdata/SimulationDataController.h"
 #include "ui/SimulationDataCustomizePropertyPage.h"
 
-using SimulationDataPoints::VtCPropertyPage;
+using SimulationDataPoints::VtCSettingsPage;
 using SimulationDataPoints::VtCSimulationDataPoint;
 
 namespace
@@ -48,14 +48,14 @@ void VtCSimulationDataCustomizeSheet::Customize()
     VtCSimulationDataRouter& router = controller.GetRouter();
     router.ResetMessageStack();
 
-    std::vector<std::unique_ptr<VtCPropertyPage>> pages;
+    std::vector<std::unique_ptr<VtCSettingsPage>> pages;
     pages.push_back(
         std::make_unique<VtCSimulationDataCustomizePropertyPage>(controller, services.texts, services.messages));
     std::size_t start = 0;
     const std::wstring activeName = router.GetActivePointName(0);
     for (const VtTDataPointPtr& point : router.GetPoints())
     {
-        std::unique_ptr<VtCPropertyPage> page(point->IsSource() ? point->CreatePropertyPage() : nullptr);
+        std::unique_ptr<VtCSettingsPage> page(point->IsSource() ? point->CreatePropertyPage() : nullptr);
         if (!page)
             continue;
         if (point.get() == router.GetActivePoint(0))
@@ -63,12 +63,12 @@ void VtCSimulationDataCustomizeSheet::Customize()
         pages.push_back(std::move(page));
     }
 
-    std::vector<VtCPropertyPage*> shown;
+    std::vector<VtCSettingsPage*> shown;
     for (const auto& page : pages)
         shown.push_back(page.get());
     if (services.sheets->ShowPropertySheet(services.texts.GetText(textSheetTitle), shown, start))
     {
-        for (VtCPropertyPage* page : shown)
+        for (VtCSettingsPage* page : shown)
             page->OnOK();
         TellPoints(activeName);
     }
@@ -92,7 +92,7 @@ bool VtCSimulationDataCustomizeSheet::CanCustomizePoint(const std::wstring& name
     if (IsFilePoint(name))
         return services.questions != nullptr;
     VtCSimulationDataPoint* point = services.sheets ? controller.GetRouter().FindPoint(name) : nullptr;
-    return point && std::unique_ptr<VtCPropertyPage>(point->CreatePropertyPage());
+    return point && std::unique_ptr<VtCSettingsPage>(point->CreatePropertyPage());
 }
 
 void VtCSimulationDataCustomizeSheet::CustomizePoint(const std::wstring& name)
@@ -114,7 +114,7 @@ void VtCSimulationDataCustomizeSheet::ChooseFile()
 void VtCSimulationDataCustomizeSheet::ShowOwnPage(const std::wstring& name)
 {
     VtCSimulationDataRouter& router = controller.GetRouter();
-    const std::unique_ptr<VtCPropertyPage> page(router.FindPoint(name)->CreatePropertyPage());
+    const std::unique_ptr<VtCSettingsPage> page(router.FindPoint(name)->CreatePropertyPage());
     if (!services.sheets->ShowPropertySheet(services.texts.GetText(textPointTitle), {page.get()}, 0))
         return;
     page->OnOK();

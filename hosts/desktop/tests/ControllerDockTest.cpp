@@ -280,11 +280,11 @@ TEST_F(Dock, HasIconsThatShowOnAnyPalette)
 }
 
 /// A page of two numbers that sum up to 100, with room for 10 to 90.
-class SharePage : public SimulationDataPoints::VtCPropertyPage
+class SharePage : public SimulationDataPoints::VtCSettingsPage
 {
 public:
     std::wstring GetTitle() const override { return L"Share"; }
-    std::vector<SimulationDataPoints::VtTPropertyField> GetFields() const override
+    std::vector<SimulationDataPoints::VtTSettingsField> GetFields() const override
     {
         return {{.label = L"One", .value = one, .editable = true, .minimum = 10, .maximum = 90},
                 {.label = L"Other", .value = 100 - one}};

@@ -50,15 +50,4 @@ TEST(Course, FollowsACircleAndFindsOffsetsFromIt)
     }
 }
 
-TEST(Course, CutsItsTableWhereElementsEnd)
-{
-    // A quarter circle of 10 m between straights whose lengths fit no table: worked by hand.
-    const double arc = 5.0 * pi;
-    const offsim::Course hook({{3.33, 0.0, 0.0}, {arc, 0.1, 0.1}, {7.77, 0.0, 0.0}});
-    const offsim::CoursePoint end = hook.At(3.33 + arc + 5.0);
-    EXPECT_NEAR(end.x, 13.33, 1e-4);
-    EXPECT_NEAR(end.y, 15.0, 1e-4);
-    EXPECT_NEAR(end.heading, pi / 2.0, 1e-9);
-}
-
 } // namespace

@@ -1,13 +1,20 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <vector>
 
-#include "simdata/points/TrackSafety.h"
-
 namespace SimulationDataPoints
 {
+
+/// Whether frames recorded with one channel layout can be played against another.
+enum TRACK_SAFETY : std::int32_t
+{
+    TRACK_SAFE = 0,
+    TRACK_SAFE_WITH_WARNING = 1, ///< the layout is not fully known to match
+    TRACK_UNSAFE = 2,            ///< also wherever there is no data point to ask
+};
 
 /// An instrument stream: its name, by which instruments are bound, and the unit of its values, which may be empty.
 struct VtTInstrumentStream

@@ -12,7 +12,7 @@
 namespace SimulationDataPoints
 {
 
-class VtCPropertyPage;
+class VtCSettingsPage;
 class VtCSimulationDataTracker;
 class VtILoadProgress;
 
@@ -170,7 +170,7 @@ public:
     virtual VtCSimulationDataFrame* GetCurrentFrame(unsigned long& frame) = 0;
 
     /// A page for the point's own settings, which the caller deletes; null for a point without any.
-    virtual VtCPropertyPage* CreatePropertyPage() { return nullptr; }
+    virtual VtCSettingsPage* CreatePropertyPage() { return nullptr; }
 
     /// The point becomes the chosen one, or is no longer.
     virtual void OnSelect() {}

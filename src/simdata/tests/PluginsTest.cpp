@@ -5,6 +5,7 @@
 
 #include "base/Paths.h"
 #include "base/Text.h"
+#include "simdata/points/MotionDataInfo.h"
 #include "simdata/tests/SimulationFixture.h"
 
 using namespace simtest;
@@ -46,10 +47,12 @@ TEST_F(Plugins, LoadWhatIsThereAndTellWhatIsWrong)
         const wchar_t* module;
         const wchar_t* reason; ///< a part of it
     };
-    // In the order of loading. No module of the kind OffSim is there, which is silent.
+    // In the order of loading.
     const Expected expected[] = {
         {L"SimulationDataPointFileU.so", L"DllCreateSimulationDataPointFactory"},
         {L"SimulationDataPointNetworkU.so", L"gave no data point"},
+        {L"SimulationDataPointOffSimU.so",
+         L"built with version 2 of the data point interface, and this program has version 1"},
         {L"SimulationDataPointHardwareU.so", L"no licence"},
         {L"SimulationDataPointSmartU.so", L"SimulationDataPointSmartU.so"},
     };
@@ -61,37 +64,27 @@ TEST_F(Plugins, LoadWhatIsThereAndTellWhatIsWrong)
         EXPECT_NE(faults[i].reason.find(expected[i].reason), std::wstring::npos) << base::Utf8(faults[i].reason);
         EXPECT_TRUE(faults[i].path.ends_with(L"\\" + faults[i].module)) << base::Utf8(faults[i].path);
     }
-    EXPECT_TRUE(faults[3].path.starts_with(base::InnerPath(folder)));
+    EXPECT_TRUE(faults[4].path.starts_with(base::InnerPath(folder)));
+    EXPECT_TRUE(messages.Has(host::Severity::warning, 9032)) << "another version is the user's to know";
+    EXPECT_EQ(messages.shown.size(), 1U);
 
     EXPECT_TRUE(router.LoadPlugin(VtEDataPointKind::File)) << "a module without the factory is loaded all the same";
-    EXPECT_FALSE(router.LoadPlugin(VtEDataPointKind::OffSim));
+    EXPECT_FALSE(router.LoadPlugin(VtEDataPointKind::Smart));
     EXPECT_EQ(router.CreateFileDataPoint(), nullptr);
 }
 
-TEST_F(Plugins, LoadAnewOnARebuild)
-{
-    Log log;
-    Listener listener(log);
-    VtCSimulationDataRouter router(Make({testModules}));
-    router.AddChangeObject(&listener);
-    router.SelectPoint(L"From a module");
-    log.clear();
-    router.LoadPlugins();
-    EXPECT_EQ(log, (Log{"points"}));
-    EXPECT_EQ(router.GetActivePoint(0), nullptr) << "the point of before is gone";
-    EXPECT_EQ(router.GetPoints().size(), 2U) << "the kinds NetConnection and Smart";
-}
-
-TEST_F(Plugins, StayLoadedAsLongAsAPointOfTheirsLives)
+TEST_F(Plugins, LoadAnewAndStayLoadedAsLongAsAPointOfTheirsLives)
 {
     VtTDataPointPtr point;
     {
         VtCSimulationDataRouter router(Make({realModules}));
+        router.SelectPoint(L"File");
+        router.LoadPlugins();
+        EXPECT_EQ(router.GetActivePoint(), nullptr) << "the point of before is gone";
         point = router.CreateFileDataPoint();
     }
     ASSERT_NE(point, nullptr);
     EXPECT_EQ(point->IsSource(), 1);
-    point.reset();
 }
 
 TEST_F(Plugins, PlayWhatTheyStored)
@@ -99,9 +92,10 @@ TEST_F(Plugins, PlayWhatTheyStored)
     VtCSimulationDataController controller(Make({realModules}));
     VtCSimulationDataRouter& router = controller.GetRouter();
     auto made = std::make_unique<Point>(L"Live");
-    made->SetChannels({L"Body", L"Wheel"}, {L"Speed"});
+    made->SetChannels({L"Body", L"Wheel"}, {L"Speed"}, true, SimulationDataPoints::TRACK_SAFE_WITH_WARNING);
     made->Fill({1.00, 1.01, 1.02, 1.04});
     made->SetRecent(3);
+    made->stored = {L"body_1", L"wheel_2"};
     router.AddPoint(VtTDataPointPtr(made.release()));
     router.SelectPoint(L"Live");
 
@@ -118,37 +112,28 @@ TEST_F(Plugins, PlayWhatTheyStored)
     EXPECT_EQ(progress.activities[32].steps, 2);
     EXPECT_FALSE(progress.activities[32].connected || progress.activities[44].connected);
 
-    router.SelectPoint(L"file");
-    auto* point = router.GetActivePoint(0);
-    ASSERT_NE(point, nullptr);
-    ASSERT_EQ(point->GetName(), L"File");
-    point->SetProgressBarActivityID(41);
-    ASSERT_NE(point->Configure(L"MDF", base::InnerPath(file), 1, 0), 0);
+    const SimulationDataPoints::VtTMotionDataInfo info = SimulationDataPoints::ReadMotionDataInfo(file);
+    EXPECT_EQ(info.channels.poses, (std::vector<std::wstring>{L"Body", L"Wheel"}));
+    EXPECT_EQ(info.channels.storedPoses, (std::vector<std::wstring>{L"body_1", L"wheel_2"}));
+    EXPECT_EQ(info.channels.instruments, (std::vector<SimulationDataPoints::VtTInstrumentStream>{{L"Speed", L"m/s"}}));
+    EXPECT_EQ(info.channels.trackSafety, SimulationDataPoints::TRACK_SAFE_WITH_WARNING);
+    EXPECT_TRUE(info.channels.timeStamps);
+    EXPECT_EQ(info.lastTime, 1.04);
+    router.FindPoint(L"Live")->SetTimestampSupport(0);
+    EXPECT_TRUE(controller.OnCmdMsg(38743));
+    EXPECT_FALSE(SimulationDataPoints::ReadMotionDataInfo(file).channels.timeStamps);
+    router.FindPoint(L"Live")->SetTimestampSupport(1);
+    EXPECT_TRUE(controller.OnCmdMsg(38743));
+
+    ASSERT_TRUE(controller.LoadMotionData(base::InnerPath(file)));
     EXPECT_EQ(progress.activities[41].steps, progress.activities[41].count) << "the load was shown to its end";
     EXPECT_GT(progress.activities[41].count, 0);
-    router.NotifyConfiguration(point->GetConfigurationInfoText(0));
-    EXPECT_EQ(*router.GetCurrentChannels(), (std::vector<std::wstring>{L"Body", L"Wheel"}));
-
-    Log log;
-    Listener listener(log);
-    router.AddChangeObject(&listener);
-    log.clear();
+    EXPECT_FALSE(controller.LoadMotionData(base::InnerPath(folder / "none.mdf")));
+    EXPECT_EQ(*router.GetCurrentChannels(), (std::vector<std::wstring>{L"Body", L"Wheel"})) << "still loaded";
     controller.PlayOnce();
-    for (int i = 0; i < 5; ++i)
-    {
-        controller.Step();
-        clock.Advance(0.015);
-    }
-    EXPECT_EQ(log, (Log{"play File 1", "frame 1 1", "frame 2 1.01", "frame 3 1.02", "frame 4 1.04", "play File 0"}));
-    unsigned long number = 0;
-    auto* frame = point->GetRecent(number);
-    ASSERT_NE(frame, nullptr);
-    float place[3];
-    frame->GetSimulationData(1)->GetVector(place);
-    EXPECT_EQ(place[0], 4.0F);
-    SimulationDataPoints::VtTInstrumentVariant speed;
-    EXPECT_NE(frame->GetSimulationData(2)->getInstrumentValue(speed), 0);
-    EXPECT_EQ(speed.value, 4.0);
+    clock.Advance(0.025);
+    controller.Step();
+    EXPECT_EQ(router.GetRecent({}), 3UL);
 }
 
 /// As long as it stands no file grows beyond a few bytes, as on a full disk.

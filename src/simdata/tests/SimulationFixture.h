@@ -49,6 +49,10 @@ public:
     int CanRefresh() const override { return refreshes; }
     int CanPreload() const override { return preloads; }
     int GetChannelNames(std::wstring& names, int variant) const override;
+    void GetBodyChannelNames(std::vector<std::wstring>& names, int flag) const override
+    {
+        stored.empty() ? VtCSimulationDataPoint::GetBodyChannelNames(names, flag) : void(names = stored);
+    }
     int FetchOnce() override;
     SimulationDataPoints::VtCSimulationDataFrame* GetCurrentFrame(unsigned long& frame) override;
     void OnSelect() override { Note("select"); }
@@ -65,6 +69,7 @@ public:
     bool streams = true; ///< false: online there is no frame
     std::wstring type = L"TEST";
     std::wstring path = L"bench";
+    std::vector<std::wstring> stored; ///< names of the poses at the source, where they are others
     mutable int channelQuestions = 0;
 
 private:

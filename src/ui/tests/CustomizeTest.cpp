@@ -14,20 +14,20 @@ class SettingsPoint : public Point
 public:
     using Point::Point;
 
-    SimulationDataPoints::VtCPropertyPage* CreatePropertyPage() override;
+    SimulationDataPoints::VtCSettingsPage* CreatePropertyPage() override;
 
     std::wstring pathOfPage = L"set";
     int livePages = 0;
 };
 
-class SettingsPage : public SimulationDataPoints::VtCPropertyPage
+class SettingsPage : public SimulationDataPoints::VtCSettingsPage
 {
 public:
     explicit SettingsPage(SettingsPoint& owner) : point(owner) { ++point.livePages; }
     ~SettingsPage() override { --point.livePages; }
 
     std::wstring GetTitle() const override { return point.GetName(); }
-    std::vector<SimulationDataPoints::VtTPropertyField> GetFields() const override { return {}; }
+    std::vector<SimulationDataPoints::VtTSettingsField> GetFields() const override { return {}; }
     void OnFieldChanged(std::size_t, double) override {}
     void OnOK() override { point.path = point.pathOfPage; }
 
@@ -35,7 +35,7 @@ private:
     SettingsPoint& point;
 };
 
-SimulationDataPoints::VtCPropertyPage* SettingsPoint::CreatePropertyPage()
+SimulationDataPoints::VtCSettingsPage* SettingsPoint::CreatePropertyPage()
 {
     return new SettingsPage(*this);
 }

@@ -8,7 +8,7 @@
 
 #include "host/PropertySheets.h"
 #include "simdata/ControllerCommands.h"
-#include "simdata/points/PropertyPage.h"
+#include "simdata/points/SettingsPage.h"
 #include "simdata/tests/SimulationFixture.h"
 #include "ui/SimulationDataControllerDialog.h"
 #include "ui/SimulationDataCustomizeSheet.h"
@@ -60,13 +60,13 @@ class Sheets : public host::PropertySheets
 {
 public:
     bool ShowPropertySheet(const std::wstring& newTitle,
-                           const std::vector<SimulationDataPoints::VtCPropertyPage*>& pages,
+                           const std::vector<SimulationDataPoints::VtCSettingsPage*>& pages,
                            std::size_t newStart) override
     {
         title = newTitle;
         start = newStart;
         titles.clear();
-        for (SimulationDataPoints::VtCPropertyPage* page : pages)
+        for (SimulationDataPoints::VtCSettingsPage* page : pages)
             titles.push_back(page->GetTitle());
         if (edit)
             pages[0]->OnFieldChanged(0, *edit);

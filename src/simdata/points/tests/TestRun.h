@@ -38,9 +38,6 @@ public:
     std::filesystem::path path;
 };
 
-/// Calls of operator new in this process so far.
-long AllocationCount();
-
 inline std::string ReadAll(const std::filesystem::path& path)
 {
     std::ifstream file(path, std::ios::binary);
