@@ -6,7 +6,7 @@
 #include "host/Clock.h"
 #include "host/InterfaceError.h"
 #include "host/Messages.h"
-#include "hosts/common/HostMessages.h"
+#include "hosts/common/HostTexts.h"
 
 namespace hosts
 {

@@ -3,7 +3,7 @@
 #include <unistd.h>
 
 #include "base/Text.h"
-#include "hosts/common/HostMessages.h"
+#include "hosts/common/HostTexts.h"
 
 namespace console
 {

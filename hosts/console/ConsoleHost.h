@@ -4,20 +4,18 @@
 #include <memory>
 #include <string>
 
+#include "base/IniFile.h"
 #include "host/Frame.h"
 #include "host/Host.h"
 #include "host/Questions.h"
 #include "hosts/common/DocumentList.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/FileConfiguration.h"
-#include "hosts/common/FileSettings.h"
+#include "hosts/common/FileStorage.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/common/IdleLoop.h"
-#include "hosts/common/IniFile.h"
-#include "hosts/common/IniTexts.h"
 #include "hosts/common/OffscreenViews.h"
 #include "hosts/common/SelectionList.h"
-#include "hosts/common/SystemClock.h"
-#include "hosts/common/SystemPaths.h"
+#include "hosts/common/System.h"
 #include "hosts/console/ConsoleMessages.h"
 #include "hosts/console/Terminal.h"
 #include "hosts/console/TerminalProgress.h"
@@ -103,7 +101,7 @@ private:
     hosts::IniTexts texts;
     ConsoleMessages messages;
     TerminalProgress progress;
-    hosts::IniFile configurationFile;
+    base::IniFile configurationFile;
     hosts::FileConfiguration configuration;
     hosts::FileSettings settings;
     hosts::SystemPaths paths;

@@ -1,7 +1,7 @@
 #include "hosts/console/ConsoleMessages.h"
 
 #include "base/Text.h"
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/console/Terminal.h"
 
 namespace console

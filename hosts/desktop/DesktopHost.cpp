@@ -1,7 +1,7 @@
 #include "hosts/desktop/DesktopHost.h"
 
 #include "base/FrameSuspension.h"
-#include "hosts/common/HostMessages.h"
+#include "hosts/common/HostTexts.h"
 
 namespace desktop
 {

@@ -4,16 +4,15 @@
 #include <map>
 #include <memory>
 
+#include "base/IniFile.h"
 #include "host/Frame.h"
 #include "host/Host.h"
 #include "hosts/common/DocumentList.h"
-#include "hosts/common/FileConfiguration.h"
-#include "hosts/common/FileSettings.h"
+#include "hosts/common/FileStorage.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/common/IdleLoop.h"
-#include "hosts/common/IniFile.h"
-#include "hosts/common/IniTexts.h"
 #include "hosts/common/SelectionList.h"
-#include "hosts/common/SystemPaths.h"
+#include "hosts/common/System.h"
 #include "hosts/desktop/FileQuestions.h"
 #include "hosts/desktop/IdlePump.h"
 #include "hosts/desktop/MessageBoxes.h"
@@ -96,7 +95,7 @@ private:
     std::filesystem::path data;
     hosts::IniTexts texts;
     MessageBoxes messages;
-    hosts::IniFile configurationFile;
+    base::IniFile configurationFile;
     hosts::FileConfiguration configuration;
     hosts::FileSettings settings;
     hosts::SystemPaths paths;

@@ -3,7 +3,7 @@
 #include <QFileDialog>
 #include <QInputDialog>
 
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/Wording.h"
 
 namespace desktop

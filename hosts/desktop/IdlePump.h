@@ -4,7 +4,7 @@
 
 #include <QTimer>
 
-#include "hosts/common/SystemClock.h"
+#include "hosts/common/System.h"
 
 namespace hosts
 {

@@ -19,7 +19,7 @@
 #include "app/PanoramicApp.h"
 #include "app/PanoramicDocument.h"
 #include "base/Text.h"
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/ControllerDock.h"
 #include "hosts/desktop/Icons.h"
 #include "hosts/desktop/PaneMenu.h"

@@ -7,7 +7,7 @@
 #include <QTime>
 #include <QTimer>
 
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/Wording.h"
 
 namespace desktop

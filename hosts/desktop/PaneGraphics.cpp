@@ -3,15 +3,133 @@
 #include <memory>
 
 #include <osg/GLObjects>
+#include <osgViewer/GraphicsWindow>
 #include <QOffscreenSurface>
 #include <QOpenGLContext>
+#include <QPointer>
+#include <QWindow>
 
 #include "base/Text.h"
-#include "hosts/desktop/PaneContext.h"
+#include "hosts/common/ContextState.h"
 #include "hosts/desktop/ViewPane.h"
 
 namespace desktop
 {
+
+/// A context of the windowing toolkit as the scene graph library takes one: of a pane, or the root context, which has
+/// a surface that nobody sees. It raises no events.
+///
+/// The window of a pane may change its size under it. While that window can't be seen the context isn't valid, and the
+/// viewer leaves it out.
+class PaneContext : public osgViewer::GraphicsWindow
+{
+public:
+    /// Of `pane`, which may go before this does.
+    PaneContext(osg::GraphicsContext::Traits& traits, std::unique_ptr<QOpenGLContext> newContext, ViewPane& shownPane);
+
+    /// The root context.
+    PaneContext(osg::GraphicsContext::Traits& traits, std::unique_ptr<QOpenGLContext> newContext,
+                std::unique_ptr<QOffscreenSurface> newSurface);
+
+    QOpenGLContext* GetContext() const { return context.get(); }
+
+    bool valid() const override;
+    bool isSameKindAs(const osg::Object* object) const override
+    {
+        return dynamic_cast<const PaneContext*>(object) != nullptr;
+    }
+    const char* libraryName() const override { return "desktop"; }
+    const char* className() const override { return "PaneContext"; }
+
+    bool checkEvents() override { return false; }
+    void requestRedraw() override {}
+    void requestContinuousUpdate(bool) override {}
+    void requestWarpPointer(float, float) override {}
+
+protected:
+    ~PaneContext() override;
+
+    bool realizeImplementation() override;
+    bool isRealizedImplementation() const override { return realised; }
+    void closeImplementation() override;
+    bool makeCurrentImplementation() override;
+    bool makeContextCurrentImplementation(osg::GraphicsContext*) override { return makeCurrentImplementation(); }
+    bool releaseContextImplementation() override;
+    void bindPBufferToTextureImplementation(GLenum) override {}
+    void swapBuffersImplementation() override;
+
+private:
+    std::unique_ptr<QOpenGLContext> context;
+    std::unique_ptr<QOffscreenSurface> surface; ///< of the root context; null for a pane
+    QPointer<ViewPane> pane;
+    bool realised = false;
+    bool prepared = false;
+};
+
+PaneContext::PaneContext(osg::GraphicsContext::Traits& traits, std::unique_ptr<QOpenGLContext> newContext,
+                         ViewPane& shownPane)
+    : context(std::move(newContext)), pane(&shownPane)
+{
+    _traits = &traits;
+    hosts::GiveContextState(*this);
+}
+
+PaneContext::PaneContext(osg::GraphicsContext::Traits& traits, std::unique_ptr<QOpenGLContext> newContext,
+                         std::unique_ptr<QOffscreenSurface> newSurface)
+    : context(std::move(newContext)), surface(std::move(newSurface))
+{
+    _traits = &traits;
+    hosts::GiveContextState(*this);
+}
+
+PaneContext::~PaneContext()
+{
+    close(true);
+}
+
+bool PaneContext::valid() const
+{
+    return context && (surface || (pane && pane->CanBeSeen()));
+}
+
+bool PaneContext::realizeImplementation()
+{
+    realised = valid();
+    return realised;
+}
+
+void PaneContext::closeImplementation()
+{
+    if (context && QOpenGLContext::currentContext() == context.get())
+        context->doneCurrent();
+    context.reset();
+    surface.reset();
+    realised = false;
+}
+
+bool PaneContext::makeCurrentImplementation()
+{
+    QSurface* target = surface ? static_cast<QSurface*>(surface.get()) : pane ? pane->windowHandle() : nullptr;
+    if (!context || !target || !context->makeCurrent(target))
+        return false;
+    if (!prepared)
+        hosts::PrepareContextState(*this);
+    prepared = true;
+    return true;
+}
+
+bool PaneContext::releaseContextImplementation()
+{
+    if (context)
+        context->doneCurrent();
+    return context != nullptr;
+}
+
+void PaneContext::swapBuffersImplementation()
+{
+    if (context && pane && pane->windowHandle())
+        context->swapBuffers(pane->windowHandle());
+}
 
 namespace
 {

@@ -11,7 +11,7 @@
 #include "base/FrameSuspension.h"
 #include "base/Paths.h"
 #include "base/Text.h"
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/DesktopHost.h"
 #include "hosts/desktop/StateFile.h"
 #include "hosts/desktop/WindowCommands.h"

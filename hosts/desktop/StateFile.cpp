@@ -2,10 +2,10 @@
 
 #include <algorithm>
 
+#include "base/IniFile.h"
 #include "base/Text.h"
 #include "host/Messages.h"
-#include "hosts/common/HostMessages.h"
-#include "hosts/common/IniFile.h"
+#include "hosts/common/HostTexts.h"
 
 namespace desktop
 {
@@ -25,12 +25,12 @@ StateFile::StateFile(std::filesystem::path stateFile, host::MessageService& mess
 
 std::string StateFile::Get(const std::string& section, const std::string& key) const
 {
-    return hosts::IniFile(file).Find(section, key).value_or("");
+    return base::IniFile(file).Find(section, key).value_or("");
 }
 
 void StateFile::Set(const std::string& section, const std::string& key, const std::string& value)
 {
-    hosts::IniFile ini(file);
+    base::IniFile ini(file);
     if (ini.Find(section, key) == value)
         return;
     ini.Set(section, key, value);
@@ -40,7 +40,7 @@ void StateFile::Set(const std::string& section, const std::string& key, const st
 std::vector<std::string> StateFile::GetRecentFiles() const
 {
     std::vector<std::string> files;
-    for (const auto& [key, value] : hosts::IniFile(file).FindSection(recentSection).value_or(hosts::IniFile::Entries()))
+    for (const auto& [key, value] : base::IniFile(file).FindSection(recentSection).value_or(base::IniFile::Entries()))
         files.push_back(value);
     return files;
 }
@@ -61,15 +61,15 @@ void StateFile::ClearRecentFiles()
 
 void StateFile::SetRecentFiles(const std::vector<std::string>& files)
 {
-    hosts::IniFile ini(file);
-    for (const auto& [key, value] : ini.FindSection(recentSection).value_or(hosts::IniFile::Entries()))
+    base::IniFile ini(file);
+    for (const auto& [key, value] : ini.FindSection(recentSection).value_or(base::IniFile::Entries()))
         ini.Remove(recentSection, key);
     for (std::size_t i = 0; i < files.size(); ++i)
         ini.Set(recentSection, std::to_string(i + 1), files[i]);
     Save(ini);
 }
 
-void StateFile::Save(const hosts::IniFile& ini)
+void StateFile::Save(const base::IniFile& ini)
 {
     const std::string reason = ini.Save();
     if (reason.empty() || warned)

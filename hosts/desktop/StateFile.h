@@ -4,13 +4,13 @@
 #include <string>
 #include <vector>
 
+namespace base
+{
+class IniFile;
+}
 namespace host
 {
 class MessageService;
-}
-namespace hosts
-{
-class IniFile;
 }
 
 namespace desktop
@@ -38,7 +38,7 @@ public:
 
 private:
     void SetRecentFiles(const std::vector<std::string>& files);
-    void Save(const hosts::IniFile& ini);
+    void Save(const base::IniFile& ini);
 
     std::filesystem::path file;
     host::MessageService& messages;

@@ -11,7 +11,7 @@
 
 #include "base/Text.h"
 #include "host/InterfaceError.h"
-#include "hosts/common/HostMessages.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/PaneGraphics.h"
 #include "hosts/desktop/Session.h"
 #include "hosts/desktop/TestHook.h"

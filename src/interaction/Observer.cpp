@@ -5,9 +5,9 @@
 
 #include <osgViewer/View>
 
+#include "base/IniFile.h"
 #include "base/Maths.h"
 #include "base/Numbers.h"
-#include "base/SettingsAccess.h"
 #include "base/Text.h"
 #include "interaction/InteractionServices.h"
 #include "interaction/Observers.h"

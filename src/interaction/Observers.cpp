@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
+#include "base/IniFile.h"
 #include "base/Numbers.h"
-#include "base/SettingsAccess.h"
 #include "base/Text.h"
 #include "host/Messages.h"
 #include "interaction/InteractionServices.h"

@@ -1,10 +1,10 @@
 #include <gtest/gtest.h>
 
 #include "app/PanoramicDocument.h"
+#include "base/IniFile.h"
 #include "base/Paths.h"
 #include "base/Text.h"
 #include "hosts/common/EglGraphics.h"
-#include "hosts/common/IniFile.h"
 #include "interaction/Observer.h"
 #include "interaction/Observers.h"
 #include "scene/MovableBody.h"
@@ -31,7 +31,7 @@ TEST(DefaultObservers, EveryOneThatIsShippedRidesOnItsVehicleAndLooksAtItOrAhead
     hosts::EglGraphics graphics;
     host.graphics = &graphics;
     host.paths.module = base::InnerPath(PANORAMIC_BIN) + L"\\";
-    const hosts::IniFile texts(std::filesystem::path(PANORAMIC_SHARE) / "texts" / "en.ini");
+    const base::IniFile texts(std::filesystem::path(PANORAMIC_SHARE) / "texts" / "en.ini");
     host.texts.known[textFollowModes] = base::Wide(texts.Find("texts", std::to_string(textFollowModes)).value_or(""));
     VtCPanoramicApp app(host);
     fake::StartApplication(app);

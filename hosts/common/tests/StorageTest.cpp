@@ -3,11 +3,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "hosts/common/FileConfiguration.h"
-#include "hosts/common/FileSettings.h"
-#include "hosts/common/HostMessages.h"
-#include "hosts/common/IniFile.h"
-#include "hosts/common/IniTexts.h"
+#include "base/IniFile.h"
+#include "hosts/common/FileStorage.h"
+#include "hosts/common/HostTexts.h"
 #include "tests/support/FakeHost.h"
 #include "tests/support/TemporaryFolder.h"
 
@@ -76,14 +74,14 @@ TEST_F(Storage, ADamagedFileIsToldAndLeftAsItIs)
         EXPECT_EQ(TemporaryFolder::Read(file), bad.content);
     }
     std::filesystem::create_directory(folder.path / "folder.ini");
-    EXPECT_NE(hosts::IniFile(folder.path / "folder.ini").Error(), "");
-    EXPECT_EQ(hosts::IniFile(folder.path / "missing.ini").Error(), "");
+    EXPECT_NE(base::IniFile(folder.path / "folder.ini").Error(), "");
+    EXPECT_EQ(base::IniFile(folder.path / "missing.ini").Error(), "");
 }
 
 TEST_F(Storage, AHandWrittenFileKeepsItsComments)
 {
     const auto file = folder.Write("c.ini", "; mine\n[Panoramic]\n# why\nMaxTracks = 3\nSimulationBufferFrames=5000\n");
-    hosts::IniFile ini(file);
+    base::IniFile ini(file);
     hosts::FileConfiguration configuration(ini, messages);
     EXPECT_EQ(configuration.GetMaxTracks(), 3);
     EXPECT_EQ(configuration.GetSimulationBufferFrames(), 5000);
@@ -92,7 +90,7 @@ TEST_F(Storage, AHandWrittenFileKeepsItsComments)
     const std::string text = TemporaryFolder::Read(file);
     EXPECT_NE(text.find("; mine"), std::string::npos);
     EXPECT_NE(text.find("# why"), std::string::npos);
-    hosts::IniFile again(file);
+    base::IniFile again(file);
     hosts::FileConfiguration next(again, messages);
     EXPECT_EQ(next.GetSimulationBufferFrames(), 6000);
     EXPECT_EQ(next.GetTrackBufferFrames(), 7000);
@@ -102,14 +100,14 @@ TEST_F(Storage, AHandWrittenFileKeepsItsComments)
 
 TEST_F(Storage, AnImpossibleNumberIsToldWithItsKeyAndTheDefaultStands)
 {
-    hosts::IniFile none(folder.path / "none.ini");
+    base::IniFile none(folder.path / "none.ini");
     const hosts::FileConfiguration defaults(none, messages);
     EXPECT_TRUE(messages.shown.empty());
     EXPECT_GE(defaults.GetSimulationBufferFrames(), 1000);
     EXPECT_GE(defaults.GetTrackBufferFrames(), 1000);
 
-    hosts::IniFile ini(folder.Write("c.ini", "[Panoramic]\nMaxTracks = -1\nSimulationBufferFrames = 999\n"
-                                             "TrackBufferFrames = many\n"));
+    base::IniFile ini(folder.Write("c.ini", "[Panoramic]\nMaxTracks = -1\nSimulationBufferFrames = 999\n"
+                                            "TrackBufferFrames = many\n"));
     const hosts::FileConfiguration configuration(ini, messages);
     EXPECT_EQ(configuration.GetMaxTracks(), defaults.GetMaxTracks());
     EXPECT_EQ(configuration.GetSimulationBufferFrames(), defaults.GetSimulationBufferFrames());
@@ -126,7 +124,7 @@ TEST_F(Storage, AFolderThatCannotBeMadeIsToldAndTheValuesStand)
     EXPECT_FALSE(settings.Store({L"Visualisation", {{L"M", 1U}}}));
     ASSERT_EQ(messages.shown.size(), 1U);
     EXPECT_EQ(messages.shown[0].number, hosts::messageNotStored);
-    hosts::IniFile nowhere{std::filesystem::path()};
+    base::IniFile nowhere{std::filesystem::path()};
     hosts::FileConfiguration configuration(nowhere, messages);
     configuration.SetTrackBufferFrames(2000);
     EXPECT_EQ(configuration.GetTrackBufferFrames(), 2000);

@@ -2,13 +2,12 @@
 
 #include <cstdlib>
 
+#include "base/IniFile.h"
 #include "base/Paths.h"
 #include "hosts/common/DocumentList.h"
-#include "hosts/common/HostMessages.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/common/IdleLoop.h"
-#include "hosts/common/IniFile.h"
-#include "hosts/common/SystemClock.h"
-#include "hosts/common/SystemPaths.h"
+#include "hosts/common/System.h"
 #include "tests/support/FakeHost.h"
 #include "tests/support/TemporaryFolder.h"
 
@@ -40,7 +39,7 @@ TEST(SystemPaths, LibrariesComeFromTheEnvironmentTheConfigurationOrTheExample)
     const Variable objects("PANORAMIC_OBJECTS", "");
     const Variable customer("PANORAMIC_CUSTOMER_OBJECTS", "");
     {
-        const hosts::IniFile none{std::filesystem::path()};
+        const base::IniFile none{std::filesystem::path()};
         const hosts::SystemPaths paths(none, "/data", "/app/bin");
         EXPECT_EQ(paths.GetObjectsPath(), L"\\data\\example\\Vantor Objects\\advanced");
         EXPECT_EQ(paths.GetObjectsSubfolder(), L"\\advanced");
@@ -48,7 +47,7 @@ TEST(SystemPaths, LibrariesComeFromTheEnvironmentTheConfigurationOrTheExample)
         EXPECT_EQ(paths.GetModuleDirectory(), L"\\app\\bin\\");
         EXPECT_EQ(hosts::SystemPaths(none, "/data", "").GetModuleDirectory(), L"");
     }
-    const hosts::IniFile ini(
+    const base::IniFile ini(
         folder.Write("c.ini", "[Libraries]\nObjects = /lib/objects/\nCustomerObjects = /lib/own/\n"));
     EXPECT_EQ(hosts::SystemPaths(ini, "/data", "").GetObjectsPath(), L"\\lib\\objects\\advanced");
     EXPECT_EQ(hosts::SystemPaths(ini, "/data", "").GetCustomerPath(), L"\\lib\\own");

@@ -13,7 +13,7 @@
 #include <QPushButton>
 #include <QTest>
 
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/CommandActions.h"
 #include "hosts/desktop/Icons.h"
 #include "hosts/desktop/WindowCommands.h"

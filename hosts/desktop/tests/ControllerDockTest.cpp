@@ -19,7 +19,7 @@
 #include <QTimer>
 #include <QToolButton>
 
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 #include "hosts/desktop/CommandActions.h"
 #include "hosts/desktop/ControllerDock.h"
 #include "hosts/desktop/PropertySheets.h"

@@ -1,14 +1,33 @@
-#include "hosts/common/SystemPaths.h"
+#include "hosts/common/System.h"
 
 #include <cstdlib>
+#include <ctime>
 #include <initializer_list>
 
+#include "base/IniFile.h"
 #include "base/Paths.h"
 #include "base/Text.h"
-#include "hosts/common/IniFile.h"
 
 namespace hosts
 {
+
+std::uint32_t SystemClock::TickCount() const
+{
+    return static_cast<std::uint32_t>(Counter() / 1000000);
+}
+
+std::int64_t SystemClock::Counter() const
+{
+    timespec now{};
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return 1 + now.tv_sec * std::int64_t{1000000000} + now.tv_nsec;
+}
+
+void SystemClock::Sleep(std::uint32_t milliseconds)
+{
+    const timespec span{static_cast<time_t>(milliseconds / 1000), static_cast<long>(milliseconds % 1000) * 1000000};
+    nanosleep(&span, nullptr);
+}
 
 namespace
 {
@@ -28,7 +47,7 @@ std::wstring WithoutTrailingSeparators(std::wstring path)
     return path;
 }
 
-std::wstring LibraryRoot(const char* variable, const IniFile& configuration, const char* key,
+std::wstring LibraryRoot(const char* variable, const base::IniFile& configuration, const char* key,
                          const std::filesystem::path& fallback)
 {
     std::filesystem::path root = Environment(variable);
@@ -84,7 +103,7 @@ std::filesystem::path ConfigurationFile(const char* name)
     return folder.empty() ? folder : folder / name;
 }
 
-SystemPaths::SystemPaths(const IniFile& configuration, const std::filesystem::path& data,
+SystemPaths::SystemPaths(const base::IniFile& configuration, const std::filesystem::path& data,
                          const std::filesystem::path& moduleFolder)
     : objects(
           LibraryRoot("PANORAMIC_OBJECTS", configuration, "Objects", data / "example" / "Vantor Objects" / "advanced")),

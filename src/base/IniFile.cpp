@@ -1,4 +1,4 @@
-#include "hosts/common/IniFile.h"
+#include "base/IniFile.h"
 
 #include <cerrno>
 #include <cstring>
@@ -8,16 +8,12 @@
 
 // Everything is UTF-8 here, so the library's conversions stay out.
 #define SI_NO_CONVERSION
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wpedantic"
-#pragma GCC diagnostic ignored "-Wshadow"
 #include <SimpleIni.h>
-#pragma GCC diagnostic pop
 
 #include "base/AtomicFile.h"
 #include "base/Text.h"
 
-namespace hosts
+namespace base
 {
 
 struct IniFile::Content
@@ -37,13 +33,13 @@ std::string Fault(std::string_view text)
     {
         ++number;
         const std::size_t end = text.find('\n');
-        const std::string_view line = base::Trim(text.substr(0, end));
+        const std::string_view line = Trim(text.substr(0, end));
         text.remove_prefix(end == std::string_view::npos ? text.size() : end + 1);
 
         const auto at = [&](const char* what) { return "line " + std::to_string(number) + ": " + what; };
         if (line.find('\0') != std::string_view::npos)
             return at("not a text file");
-        if (base::Utf8(base::Wide(line)) != line)
+        if (Utf8(Wide(line)) != line)
             return at("not in UTF-8");
         if (line.empty() || line.front() == ';' || line.front() == '#')
             continue;
@@ -58,7 +54,8 @@ std::string Fault(std::string_view text)
 
 } // namespace
 
-IniFile::IniFile(std::filesystem::path file) : path(std::move(file)), content(std::make_unique<Content>())
+IniFile::IniFile(std::filesystem::path file, Faults faults)
+    : path(std::move(file)), content(std::make_unique<Content>())
 {
     std::error_code failed;
     if (path.empty() || (!std::filesystem::exists(path, failed) && !failed))
@@ -74,7 +71,7 @@ IniFile::IniFile(std::filesystem::path file) : path(std::move(file)), content(st
         return;
     }
     text.assign(std::istreambuf_iterator<char>(in), {});
-    if (const std::string fault = Fault(text); !fault.empty())
+    if (const std::string fault = faults == Faults::told ? Fault(text) : std::string(); !fault.empty())
     {
         error = path.string() + ", " + fault;
         return;
@@ -131,7 +128,39 @@ std::string IniFile::Save() const
     std::filesystem::create_directories(path.parent_path(), failed);
     if (failed)
         return path.parent_path().string() + ": " + failed.message();
-    return base::WriteWholeFile(path, text);
+    return WriteWholeFile(path, text);
 }
 
-} // namespace hosts
+} // namespace base
+
+namespace
+{
+
+class FileReader : public VtISettingsReader
+{
+public:
+    explicit FileReader(base::IniFile settings) : file(std::move(settings)) {}
+
+    int ReadText(const std::wstring& section, const std::wstring& key, std::wstring& value) const override
+    {
+        const std::optional<std::string> text = file.Find(base::Utf8(section), base::Utf8(key));
+        if (!text)
+            return missing;
+        value = base::Wide(*text);
+        return found;
+    }
+
+private:
+    base::IniFile file;
+};
+
+} // namespace
+
+std::unique_ptr<VtISettingsReader> OpenSettings(const std::filesystem::path& path)
+{
+    std::error_code failed;
+    if (!std::filesystem::is_regular_file(path, failed))
+        return nullptr;
+    base::IniFile file(path, base::IniFile::Faults::skipped);
+    return file.Error().empty() ? std::make_unique<FileReader>(std::move(file)) : nullptr;
+}

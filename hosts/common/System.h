@@ -3,12 +3,30 @@
 #include <filesystem>
 #include <string>
 
+#include "host/Clock.h"
 #include "host/LibraryPaths.h"
+
+namespace base
+{
+class IniFile;
+}
 
 namespace hosts
 {
 
-class IniFile;
+/// The machine's monotonic clock.
+class SystemClock : public host::Clock
+{
+public:
+    std::uint32_t TickCount() const override;
+
+    /// Nanoseconds.
+    std::int64_t Counter() const override;
+    std::int64_t CounterFrequency() const override { return 1000000000; }
+
+    /// A signal ends it early, so that a loop can look at what the signal asked for.
+    void Sleep(std::uint32_t milliseconds) override;
+};
 
 /// Folder of the running program, links resolved; empty when it can't be told.
 std::filesystem::path ModuleFolder();
@@ -35,7 +53,8 @@ std::filesystem::path ConfigurationFile(const char* name);
 class SystemPaths : public host::LibraryPaths
 {
 public:
-    SystemPaths(const IniFile& configuration, const std::filesystem::path& data, const std::filesystem::path& module);
+    SystemPaths(const base::IniFile& configuration, const std::filesystem::path& data,
+                const std::filesystem::path& module);
 
     std::wstring GetObjectsPath() const override { return objects; }
     std::wstring GetObjectsSubfolder() const override;

@@ -1,13 +1,26 @@
 #pragma once
 
+#include <cstdint>
 #include <filesystem>
 #include <map>
 #include <string>
 
 #include "host/Messages.h"
 
+namespace base
+{
+class IniFile;
+}
+
 namespace hosts
 {
+
+// Messages that the hosts themselves have for the user, by their number in the texts. The component's own numbers lie
+// below 9100.
+inline constexpr std::uint32_t messageInterfaceFailed = 9101; ///< %1 the interface, %2 the result code
+inline constexpr std::uint32_t messageDefaultsUsed = 9102;    ///< %1 file and reason
+inline constexpr std::uint32_t messageNotStored = 9103;       ///< %1 file and reason
+inline constexpr std::uint32_t messageTextsMissing = 9104;    ///< %1 file and reason
 
 /// Texts by number from a file: "417 = The scene %1 cannot be shown." in the section [texts].
 class IniTexts : public host::Texts
@@ -29,5 +42,8 @@ private:
     std::map<std::uint32_t, std::wstring> texts;
     std::string error;
 };
+
+/// Tells what was wrong with the files that a host begins with; nothing when all went well.
+void WarnOfFiles(host::MessageService& messages, const IniTexts& texts, const base::IniFile& configuration);
 
 } // namespace hosts

@@ -1,15 +1,16 @@
-#include "hosts/common/IniTexts.h"
+#include "hosts/common/HostTexts.h"
 
+#include "base/IniFile.h"
 #include "base/Numbers.h"
 #include "base/Text.h"
-#include "hosts/common/IniFile.h"
+#include "host/Messages.h"
 
 namespace hosts
 {
 
 IniTexts::IniTexts(const std::filesystem::path& file)
 {
-    const IniFile ini(file);
+    const base::IniFile ini(file);
     error = ini.Error();
     const auto entries = ini.FindSection("texts");
     if (!entries)
@@ -56,6 +57,17 @@ std::wstring IniTexts::Format(const host::Texts& texts, std::uint32_t number, co
             behind = L", ";
         }
     return result;
+}
+
+void WarnOfFiles(host::MessageService& messages, const IniTexts& texts, const base::IniFile& configuration)
+{
+    const auto warn = [&messages](std::uint32_t number, const std::string& reason)
+    {
+        if (!reason.empty())
+            messages.Show({.number = number, .first = base::Wide(reason), .severity = host::Severity::warning});
+    };
+    warn(messageTextsMissing, texts.Error());
+    warn(messageDefaultsUsed, configuration.Error());
 }
 
 } // namespace hosts

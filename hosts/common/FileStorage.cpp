@@ -1,13 +1,71 @@
-#include "hosts/common/FileSettings.h"
+#include "hosts/common/FileStorage.h"
 
+#include <limits>
+
+#include "base/IniFile.h"
 #include "base/Numbers.h"
 #include "base/Text.h"
 #include "host/Messages.h"
-#include "hosts/common/HostMessages.h"
-#include "hosts/common/IniFile.h"
+#include "hosts/common/HostTexts.h"
 
 namespace hosts
 {
+
+namespace
+{
+
+constexpr const char* section = "Panoramic";
+
+// Ten minutes at 100 Hz for the simulation and four such runs for the tracks. A buffer takes memory only as it fills.
+constexpr std::int32_t defaultSimulationBufferFrames = 60000;
+constexpr std::int32_t defaultTrackBufferFrames = 240000;
+constexpr std::int32_t smallestBuffer = 1000;
+constexpr std::int32_t defaultMaxTracks = 10;
+
+} // namespace
+
+FileConfiguration::FileConfiguration(base::IniFile& ini, host::MessageService& service)
+    : file(ini),
+      messages(service),
+      trackBufferFrames(Read("TrackBufferFrames", smallestBuffer, defaultTrackBufferFrames)),
+      simulationBufferFrames(Read("SimulationBufferFrames", smallestBuffer, defaultSimulationBufferFrames)),
+      maxTracks(Read("MaxTracks", 0, defaultMaxTracks))
+{
+}
+
+std::int32_t FileConfiguration::Read(const char* key, std::int32_t lowest, std::int32_t byDefault)
+{
+    const auto text = file.Find(section, key);
+    if (!text)
+        return byDefault;
+    const auto value = base::ParseInteger(*text);
+    if (value && *value >= lowest && *value <= std::numeric_limits<std::int32_t>::max())
+        return static_cast<std::int32_t>(*value);
+
+    const std::string reason = file.Path().string() + ": \"" + *text + "\" is no value for " + key;
+    messages.Show({.number = messageDefaultsUsed, .first = base::Wide(reason), .severity = host::Severity::warning});
+    return byDefault;
+}
+
+void FileConfiguration::SetTrackBufferFrames(std::int32_t frames)
+{
+    trackBufferFrames = frames;
+    Write("TrackBufferFrames", frames);
+}
+
+void FileConfiguration::SetSimulationBufferFrames(std::int32_t frames)
+{
+    simulationBufferFrames = frames;
+    Write("SimulationBufferFrames", frames);
+}
+
+void FileConfiguration::Write(const char* key, std::int32_t value)
+{
+    file.Set(section, key, std::to_string(value));
+    const std::string reason = file.Save();
+    if (!reason.empty())
+        messages.Show({.number = messageNotStored, .first = base::Wide(reason), .severity = host::Severity::warning});
+}
 
 namespace
 {
@@ -62,9 +120,9 @@ FileSettings::FileSettings(std::filesystem::path path, host::MessageService& ser
 
 bool FileSettings::Store(const host::SettingsNode& node)
 {
-    IniFile ini(file);
+    base::IniFile ini(file);
     const std::string section = base::Utf8(node.name);
-    for (const auto& [key, value] : ini.FindSection(section).value_or(IniFile::Entries()))
+    for (const auto& [key, value] : ini.FindSection(section).value_or(base::IniFile::Entries()))
         ini.Remove(section, key);
     for (const auto& [key, value] : node.entries)
         ini.Set(section, base::Utf8(key),
@@ -79,7 +137,7 @@ bool FileSettings::Store(const host::SettingsNode& node)
 
 std::optional<host::SettingsNode> FileSettings::Load(const std::wstring& name) const
 {
-    const IniFile ini(file);
+    const base::IniFile ini(file);
     if (!ini.Error().empty())
         Warn(ini.Error());
     const auto entries = ini.FindSection(base::Utf8(name));
