@@ -3,9 +3,6 @@
 #include <cstdlib>
 #include <filesystem>
 
-#include <osg/Notify>
-#include <osgDB/Registry>
-
 #include "app/GlidePanelToolBarEventsSink.h"
 #include "app/PanoramicDocument.h"
 #include "assets/AssetManager.h"
@@ -49,18 +46,6 @@ constexpr const wchar_t* sceneFilter = L"Scene Config Files (*.xml)|*.xml||";
 constexpr const wchar_t* sceneExtension = L".xml";
 
 } // namespace
-
-std::unique_ptr<VtCGraphicsSession> graphicsSession;
-
-VtCGraphicsSession::VtCGraphicsSession()
-{
-    osg::setNotifyLevel(osg::WARN);
-}
-
-VtCGraphicsSession::~VtCGraphicsSession()
-{
-    osgDB::Registry::instance()->clearObjectCache();
-}
 
 VtCPanoramicApp::VtCPanoramicApp(host::Host& programAround)
     : host(programAround), messageHandler(applicationName), cycle(programAround.GetClock(), *this)
@@ -153,7 +138,7 @@ void VtCPanoramicApp::InsertGUIElements()
     if (userInterface)
     {
         userInterface->AddMenuResource(menuResource);
-        toolBarSink = std::make_unique<VtCGlidePanelToolBarEventsSink>(*this);
+        toolBarSink = std::make_unique<VtCGlidePanelToolBarEventsSink>();
         userInterface->SetToolBarEvents(toolBarSink.get());
     }
     SetApplicationVariable(L"fps", L"");
@@ -183,6 +168,8 @@ void VtCPanoramicApp::MakeController()
                                                                                      .questions = questions});
     if (sceneServices)
         sceneServices->channels = &controller->GetRouter();
+    if (toolBarSink)
+        toolBarSink->SetController(controller.get());
     MakeControllerDialog();
 }
 
@@ -231,6 +218,8 @@ void VtCPanoramicApp::StartShutdown(std::int32_t& refused)
         controller->Stop();
     if (sceneServices)
         sceneServices->channels = nullptr;
+    if (toolBarSink)
+        toolBarSink->SetController(nullptr);
     controllerDialog.reset();
     customizeSheet.reset();
     controller.reset();

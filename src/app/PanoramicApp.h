@@ -7,17 +7,16 @@
 #include <vector>
 
 #include "app/FrameCycle.h"
+#include "app/PanoramicDocument.h"
 #include "app/PanoramicMessageHandler.h"
 #include "app/VisualizationPPGSettings.h"
 #include "host/Commands.h"
-#include "simdata/SimulationServices.h"
 
 namespace host
 {
 class Configuration;
 class DocumentManager;
 class Graphics;
-class Host;
 class Progress;
 class Questions;
 class UserInterface;
@@ -25,28 +24,10 @@ class UserInterface;
 
 class VtCBase3DView;
 class VtCGlidePanelToolBarEventsSink;
-class VtCPanoramicDocument;
 class VtCSceneObjectStore;
-class VtCSimulationDataController;
 class VtCSimulationDataControllerDialog;
 class VtCSimulationDataCustomizeSheet;
 class VtISceneListener;
-struct VtTSceneServices;
-
-/// Its existence means that the scene graph library is set up for the process. The first document makes it, and it
-/// stays until the component shuts down. The idle step draws only while it exists.
-class VtCGraphicsSession
-{
-public:
-    /// Brings the library's reports down to warnings and errors: at its usual level it tells about every driver.
-    VtCGraphicsSession();
-    ~VtCGraphicsSession();
-    VtCGraphicsSession(const VtCGraphicsSession&) = delete;
-    VtCGraphicsSession& operator=(const VtCGraphicsSession&) = delete;
-};
-
-/// The one of the process; null while there is none.
-extern std::unique_ptr<VtCGraphicsSession> graphicsSession;
 
 /// The application object: what the host drives, and what everything outermost reaches the others by.
 ///
@@ -54,7 +35,7 @@ extern std::unique_ptr<VtCGraphicsSession> graphicsSession;
 /// here, on the thread that owns its windows, and raises idle events in between. Documents come and go after
 /// `FinalizeInitialization` and are closed before `StartShutdown`. A call of the host that fails throws
 /// `host::InterfaceError` through here; the host catches and shows it.
-class VtCPanoramicApp : public VtIActiveScene,
+class VtCPanoramicApp : public VtIDocumentApplication,
                         public host::CommandTarget,
                         private VtIFrameWork,
                         private VtISettingsEffects
@@ -97,8 +78,8 @@ public:
 
     std::int32_t IdleStep() { return cycle.IdleStep(); }
     void RedrawNow() { cycle.RedrawNow(); }
-    void ConnectIdleSink() { cycle.ConnectIdleSink(); }
-    void DisconnectIdleSink() { cycle.DisconnectIdleSink(); }
+    void ConnectIdleSink() override { cycle.ConnectIdleSink(); }
+    void DisconnectIdleSink() override { cycle.DisconnectIdleSink(); }
     VtCFrameCycle& GetFrameCycle() { return cycle; }
 
     /// Does an active document hold a scene?
@@ -126,39 +107,39 @@ public:
     /// their first object on.
     void AddSceneListener(VtISceneListener& listener);
     void RemoveSceneListener(VtISceneListener& listener);
-    const std::vector<VtISceneListener*>& GetSceneListeners() const { return sceneListeners; }
+    const std::vector<VtISceneListener*>& GetSceneListeners() const override { return sceneListeners; }
 
     /// The view that has the focus in the active document; null in a host without windows for views.
     VtCBase3DView* GetActiveView() const;
     VtIInstrumentFeed* GetActiveInstruments() const override;
 
     /// Null before `StartupCompleted` and after `StartShutdown`.
-    VtCSimulationDataController* GetController() const { return controller.get(); }
+    VtCSimulationDataController* GetController() const override { return controller.get(); }
 
     /// As long as the controller, in a host with a user interface; null otherwise.
     VtCSimulationDataControllerDialog* GetControllerDialog() const { return controllerDialog.get(); }
 
     /// Folder of the program with a trailing backslash; empty when it can't be told.
-    std::wstring GetModuleDirectory() const;
+    std::wstring GetModuleDirectory() const override;
     void SetApplicationVariable(const std::wstring& name, const std::wstring& value);
 
     /// The controller exists and is online, or a replay or spool is on.
     bool IsRunning() const;
 
     /// May a scene be made or opened? Asked before each.
-    bool CanOpenScene() const;
+    bool CanOpenScene() const override;
 
-    host::Host& GetHost() const { return host; }
-    VtCPanoramicMessageHandler& GetMessageHandler() { return messageHandler; }
+    host::Host& GetHost() const override { return host; }
+    VtCPanoramicMessageHandler& GetMessageHandler() override { return messageHandler; }
 
     /// What objects of scenes need; from `ConnectToOtherComponents` to `RemoveComponentConnections`.
-    VtTSceneServices& GetSceneServices() { return *sceneServices; }
+    VtTSceneServices& GetSceneServices() override { return *sceneServices; }
 
     /// Null when the host keeps no settings.
     VtCVisualizationPPGSettings* GetSettings() const { return settings.get(); }
 
     /// Read by the camera manipulator.
-    std::uint32_t GetMouseSensitivity() const { return mouseSensitivity; }
+    std::uint32_t GetMouseSensitivity() const override { return mouseSensitivity; }
 
     /// Is anti-aliasing by several samples on? Read by the next viewer that is made.
     bool IsMultisampling() const { return multisampling; }

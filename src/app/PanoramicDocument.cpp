@@ -3,12 +3,16 @@
 #include <filesystem>
 #include <system_error>
 
+#include <osg/Notify>
+#include <osgDB/Registry>
+
 #include "app/DayLight.h"
-#include "app/PanoramicApp.h"
 #include "app/SceneLoader.h"
 #include "base/Paths.h"
 #include "base/Text.h"
+#include "host/Clock.h"
 #include "host/Host.h"
+#include "host/Messages.h"
 #include "host/Selection.h"
 #include "host/ViewWindows.h"
 #include "interaction/MouseInput.h"
@@ -40,7 +44,19 @@ std::wstring Shown(const std::wstring& path)
 
 } // namespace
 
-VtCPanoramicDocument::VtCPanoramicDocument(VtCPanoramicApp& application) : app(application)
+std::unique_ptr<VtCGraphicsSession> graphicsSession;
+
+VtCGraphicsSession::VtCGraphicsSession()
+{
+    osg::setNotifyLevel(osg::WARN);
+}
+
+VtCGraphicsSession::~VtCGraphicsSession()
+{
+    osgDB::Registry::instance()->clearObjectCache();
+}
+
+VtCPanoramicDocument::VtCPanoramicDocument(VtIDocumentApplication& application) : app(application)
 {
     ++openDocuments;
     if (!graphicsSession)

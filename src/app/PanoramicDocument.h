@@ -2,18 +2,65 @@
 
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "host/Documents.h"
 #include "interaction/InteractionServices.h"
 #include "scene/RecordBuilders.h"
 #include "scene/SceneObjects.h"
 #include "scene/SceneServices.h"
+#include "simdata/SimulationServices.h"
 
+namespace host
+{
+class Host;
+}
 class VtC3DObservers;
 class VtCChildFrame;
 class VtCMouseInputManager;
-class VtCPanoramicApp;
+class VtCSimulationDataController;
 class VtCSimulationDataReceiver;
+
+/// Its existence means that the scene graph library is set up for the process. The first document makes it, and it
+/// stays until the component shuts down. The idle step draws only while it exists.
+class VtCGraphicsSession
+{
+public:
+    /// Brings the library's reports down to warnings and errors: at its usual level it tells about every driver.
+    VtCGraphicsSession();
+    ~VtCGraphicsSession();
+    VtCGraphicsSession(const VtCGraphicsSession&) = delete;
+    VtCGraphicsSession& operator=(const VtCGraphicsSession&) = delete;
+};
+
+/// The one of the process; null while there is none.
+extern std::unique_ptr<VtCGraphicsSession> graphicsSession;
+
+/// What a document needs of the application, which outlives it. The application object implements it.
+class VtIDocumentApplication : public VtIActiveScene
+{
+public:
+    virtual host::Host& GetHost() const = 0;
+    virtual host::MessageHandler& GetMessageHandler() = 0;
+    virtual VtTSceneServices& GetSceneServices() = 0;
+
+    /// Who hears of the scenes of all documents, from their first object on.
+    virtual const std::vector<VtISceneListener*>& GetSceneListeners() const = 0;
+
+    /// Null outside of the time between start-up and shutdown.
+    virtual VtCSimulationDataController* GetController() const = 0;
+
+    /// May a scene be made or opened? Asked before each.
+    virtual bool CanOpenScene() const = 0;
+
+    /// Folder of the program with a trailing backslash; empty when it can't be told.
+    virtual std::wstring GetModuleDirectory() const = 0;
+    virtual std::uint32_t GetMouseSensitivity() const = 0;
+
+    /// Suspend the frame cycle and take it up again.
+    virtual void DisconnectIdleSink() = 0;
+    virtual void ConnectIdleSink() = 0;
+};
 
 /// A document: one scene with its observers and its frame of views, and the receiver by which simulation data get to
 /// it. The host's document manager owns it.
@@ -29,7 +76,7 @@ public:
     static constexpr const wchar_t* defaultObserversFile = L"DefaultObservers.ini";
 
     /// Sets the scene graph library up if this is the first document. `application` outlives this.
-    explicit VtCPanoramicDocument(VtCPanoramicApp& application);
+    explicit VtCPanoramicDocument(VtIDocumentApplication& application);
 
     /// Views, observers and scene go, and the viewer.
     ~VtCPanoramicDocument() override;
@@ -67,7 +114,7 @@ private:
     void MakeChildFrame();
     bool LoadScene(const std::wstring& path, std::wstring& reason);
 
-    VtCPanoramicApp& app;
+    VtIDocumentApplication& app;
     VtCScene3D* scene = nullptr; ///< set by the scene's own constructor, before it is whole
     std::unique_ptr<VtCScene3D> ownedScene;
     VtC3DObservers* observers = nullptr; ///< one reference
