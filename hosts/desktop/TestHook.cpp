@@ -256,7 +256,7 @@ TestHook::TestHook(VtCPanoramicApp& application, DesktopHost& desktopHost, MainW
                                           {
                                               while (socket->canReadLine())
                                               {
-                                                  socket->readLine();
+                                                  Obey(socket->readLine().trimmed());
                                                   socket->write((Describe() + "\n").c_str());
                                               }
                                               socket->flush();
@@ -266,6 +266,15 @@ TestHook::TestHook(VtCPanoramicApp& application, DesktopHost& desktopHost, MainW
 
 TestHook::~TestHook() = default;
 
+void TestHook::Obey(const QByteArray& line)
+{
+    host::MainWindow& mainWindow = *host.GetMainWindow();
+    if (line == "hide")
+        mainWindow.Hide();
+    else if (line == "show")
+        mainWindow.ShowMaximised();
+}
+
 std::string TestHook::Describe() const
 {
     Json state = {{"document", Path(window.GetFiles().GetScenePath())},
@@ -274,6 +283,8 @@ std::string TestHook::Describe() const
                   {"title", window.windowTitle().remove("[*]").toStdString()},
                   {"window", OnScreen(window, window.rect())},
                   {"minimised", window.isMinimized()},
+                  {"shown", window.isVisible()},
+                  {"maximised", window.isMaximized()},
                   {"has_keyboard", window.isActiveWindow()},
                   {"fps", base::Utf8(host.GetDesktopVariables().GetText(L"fps"))},
                   {"source", base::Utf8(host.GetDesktopVariables().GetText(L"simulationDatapointInfo"))},

@@ -3,6 +3,7 @@
 #include <memory>
 #include <string>
 
+class QByteArray;
 class QLocalServer;
 class VtCPanoramicApp;
 
@@ -13,7 +14,8 @@ class DesktopHost;
 class MainWindow;
 
 /// Tells tests what the program shows: with PANORAMIC_TEST_HOOK=<path> in the environment it listens on that local
-/// socket and answers each line with one line of JSON. It only reads.
+/// socket and answers each line with one line of JSON. It only reads, but for the lines "hide" and "show": the main
+/// window then leaves the screen and comes back, as for views over whole screens.
 class TestHook
 {
 public:
@@ -25,6 +27,7 @@ public:
 
 private:
     TestHook(VtCPanoramicApp& application, DesktopHost& desktopHost, MainWindow& mainWindow);
+    void Obey(const QByteArray& line);
     std::string Describe() const;
 
     VtCPanoramicApp& app;

@@ -38,11 +38,11 @@ class Application:
                                         stderr=self._log)
         self._hook: socket.socket | None = None
 
-    def state(self) -> State:
-        """The program's state now; waits for the program to listen first."""
+    def state(self, line: str = "state") -> State:
+        """The program's state now, after it has obeyed `line`; waits for the program to listen first."""
         if self._hook is None:
             self._hook = self._connect()
-        self._hook.sendall(b"state\n")
+        self._hook.sendall(line.encode() + b"\n")
         answer = b""
         while not answer.endswith(b"\n"):
             part = self._hook.recv(1 << 20)

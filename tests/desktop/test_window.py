@@ -312,6 +312,18 @@ class WindowTest(unittest.TestCase):
                                       "it draws again")
         self.assertGreater(state["time"], after["time"] + 1, "the data are where the clock is")
 
+    def test_a_hidden_window_comes_back_over_the_screen_and_draws(self) -> None:
+        self.start_example("--play")
+        hidden = self.application.state("hide")
+        self.assertFalse(hidden["shown"])
+        self.assertFalse(hidden["minimised"], "the cycle goes on for what else is on the screen")
+        moved = self.application.wait(lambda s: s["frame"] > hidden["frame"] + 5, "the replay goes on")
+        self.application.state("show")
+        self.application.wait(lambda s: s["shown"] and s["maximised"] and s["drawn_frames"] > moved["drawn_frames"] + 2,
+                              "it draws again")
+        for number in range(1, 5):
+            self.assertGreater(spread(self.pane_picture(number)), 20, f"pane {number}")
+
     # Keeping
 
     def test_a_changed_scene_is_asked_for_and_saved_whole(self) -> None:
