@@ -109,6 +109,7 @@ void VtCPanoramicDocument::MakeChildFrame()
                                                                        .interaction = *this,
                                                                        .mouseInputManager = *mouseInputManager,
                                                                        .windows = *windows,
+                                                                       .selection = app.GetHost().GetSelection(),
                                                                        .clock = app.GetHost().GetClock()});
 }
 
