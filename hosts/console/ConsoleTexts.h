@@ -19,7 +19,10 @@ inline constexpr std::uint32_t messageFolderNotMade = 9122; ///< %1 folder and r
 inline constexpr std::uint32_t messageConversion = 9123;    ///< %1 file, place and reason
 inline constexpr std::uint32_t messageAlwaysHeadless = 9124;
 inline constexpr std::uint32_t messageInterrupted = 9125;
-inline constexpr std::uint32_t messageIsInput = 9126; ///< %1 the file
+inline constexpr std::uint32_t messageIsInput = 9126;          ///< %1 the file
+inline constexpr std::uint32_t messageNoSource = 9127;         ///< %1 the data point, %2 those there are
+inline constexpr std::uint32_t messageSourceRefuses = 9128;    ///< %1 the data point, %2 its options
+inline constexpr std::uint32_t messageSourceHasOwnTime = 9129; ///< %1 the data point
 inline constexpr std::uint32_t textPlaying = 9130;
 
 } // namespace console

@@ -21,7 +21,8 @@ struct Play
 {
     ViewArguments view;
     PlaybackArguments playback;
-    std::string speedText = "1";
+    std::string speedText;
+    double duration = 10.0; ///< seconds, of a live source
     bool headless = false;
 };
 
@@ -63,15 +64,23 @@ int Run(const Play& play)
 
 void Check(Play& play)
 {
-    const auto speed = base::ParseDouble(play.speedText);
-    if (!speed || *speed <= 0.0)
-        RejectArguments("--speed: \"" + play.speedText + "\" is not a positive number");
-    play.playback.speed = *speed;
+    const bool live = !play.view.scene.source.empty();
+    if (!play.speedText.empty())
+    {
+        const auto speed = base::ParseDouble(play.speedText);
+        if (!speed || *speed <= 0.0)
+            RejectArguments("--speed: \"" + play.speedText + "\" is not a positive number");
+        if (live)
+            RejectArguments("--speed: a live source sets its own pace");
+        play.playback.speed = *speed;
+    }
+    if (live)
+        play.playback.duration = play.duration;
     if (!play.playback.shotsFile.empty())
         play.playback.shots = ReadShots(play.playback.shotsFile);
     CheckViewArguments(play.view);
-    if (play.view.scene.data.empty())
-        RejectArguments("--data is required");
+    if (play.view.scene.data.empty() && !live)
+        RejectArguments("--data or --source is required");
     const bool hasScene = !play.view.scene.file.empty();
     if (!hasScene && !play.view.place && play.playback.shots.empty())
         RejectArguments("--eye and --look are required without --scene and --shots");
@@ -87,9 +96,14 @@ void Check(Play& play)
 void AddPlayCommand(CLI::App& program, int& status)
 {
     auto play = std::make_shared<Play>();
-    CLI::App* command = program.add_subcommand("play", "Replay a run in real time; tell how many frames a second.");
+    CLI::App* command = program.add_subcommand(
+        "play", "Replay a run, or show a live source, in real time; tell how many frames a second.");
     AddViewOptions(*command, play->view);
-    command->add_option("--speed", play->speedText, "Seconds of the data in a second.")->type_name("F");
+    command->add_option("--speed", play->speedText, "Seconds of the data in a second. [1]")->type_name("F");
+    command->add_option("--duration", play->duration, "How long a live source runs, in seconds. [10]")
+        ->type_name("SECONDS")
+        ->check(CLI::PositiveNumber)
+        ->needs("--source");
     command->add_option("--loop", play->playback.passes, "How many times the run is played. [1]")
         ->type_name("N")
         ->check(CLI::PositiveNumber);
@@ -117,6 +131,8 @@ void AddPlayCommand(CLI::App& program, int& status)
                     "  panoramic play --static road.dae --movable Car=car.dae:Chassis --data run.mdf \\\n"
                     "      --eye -8,-12,4 --look 0,0,1 --headless\n"
                     "  panoramic play @scene.args --shots shots.txt --pictures out --headless\n"
+                    "  panoramic play --static road.dae --movable Car=car.dae:Vehicle --source OffSim:seed=7 \\\n"
+                    "      --eye -8,-12,4 --look 0,0,1 --duration 30 --headless\n"
                     "Ctrl-C ends it cleanly.");
     command->callback(
         [play, &status]

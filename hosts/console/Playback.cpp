@@ -24,6 +24,7 @@ constexpr std::uint32_t progressInterval = 100; // milliseconds
 constexpr long progressSteps = 100;
 constexpr int sheetCell = 480; // pixels
 constexpr const char* sheetName = "contact-sheet.png";
+constexpr double patience = 10.0; // seconds, beyond the duration of a run
 
 } // namespace
 
@@ -37,14 +38,14 @@ bool Playback::Prepare()
 {
     if (arguments.folder.empty())
         return true;
-    const std::optional<TimeSpan> span = GetTimeSpan(session);
+    const std::optional<TimeSpan> span = Span();
     if (span && arguments.shots.empty())
         arguments.shots = EquallySpacedShots(span->first, span->last, arguments.count);
     // Without time stamps there is one shot's worth of message, and no shot.
     if (!span)
         return CheckTime(session, 0.0, viewArguments.scene.data);
     for (const Shot& shot : arguments.shots)
-        if (!CheckTime(session, shot.time, viewArguments.scene.data))
+        if (!CheckTime(session, shot.time, *span))
             return false;
 
     std::vector<std::filesystem::path> outputs{arguments.folder / sheetName};
@@ -81,25 +82,55 @@ void Playback::Run(const volatile std::sig_atomic_t& interrupted)
     PrintResult(seconds);
 }
 
-bool Playback::PlayPass(int pass, const volatile std::sig_atomic_t& interrupted)
+std::optional<TimeSpan> Playback::Span() const
+{
+    return arguments.duration ? TimeSpan{0.0, *arguments.duration} : GetTimeSpan(session);
+}
+
+bool Playback::Begin()
 {
     VtCSimulationDataController& controller = session.GetController();
-    session.GetHost().GetProgress()->SetProgresStepCount(activity, GetTimeSpan(session) ? progressSteps : 0);
-    shownSteps = 0;
+    if (arguments.duration)
+    {
+        controller.Start();
+        return controller.IsOnline();
+    }
     if (!controller.GotoFirst())
         return false;
-    const double first = CurrentTime();
     controller.PlayOnce();
+    return true;
+}
+
+bool Playback::GoesOn() const
+{
+    const VtCSimulationDataController& controller = session.GetController();
+    if (!arguments.duration)
+        return controller.HasPlayState();
+    // A source that has failed for good comes nowhere.
+    return controller.IsOnline() && CurrentTime() < *arguments.duration &&
+           SecondsSinceStart() - passStart < *arguments.duration + patience;
+}
+
+bool Playback::PlayPass(int pass, const volatile std::sig_atomic_t& interrupted)
+{
+    session.GetHost().GetProgress()->SetProgresStepCount(activity, Span() ? progressSteps : 0);
+    shownSteps = 0;
+    passStart = SecondsSinceStart();
+    if (!Begin())
+        return false;
+    const double first = CurrentTime();
     const bool ended = session.GetHost().GetIdleLoop().Run(
         [&]
         {
             TakeDueShots();
             ShowProgress(pass);
-            const bool goesOn = controller.HasPlayState() && !interrupted;
+            const bool goesOn = GoesOn() && !interrupted;
             frames += goesOn;
             return goesOn;
         });
     played += CurrentTime() - first;
+    if (arguments.duration)
+        session.GetController().Stop();
     return ended && !interrupted;
 }
 
@@ -157,7 +188,7 @@ void Playback::ShowProgress(int pass)
     if (now - lastProgress < progressInterval)
         return;
     lastProgress = now;
-    const std::optional<TimeSpan> span = GetTimeSpan(session);
+    const std::optional<TimeSpan> span = Span();
     std::wstring text = arguments.passes > 1 ? fmt::format(L"pass {} of {}, ", pass, arguments.passes) : L"";
     host::Progress& progress = *session.GetHost().GetProgress();
     if (span && span->last > span->first)

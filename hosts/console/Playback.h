@@ -3,6 +3,7 @@
 #include <csignal>
 #include <cstdint>
 #include <filesystem>
+#include <optional>
 #include <vector>
 
 #include "hosts/console/Command.h"
@@ -17,6 +18,7 @@ class Session;
 struct PlaybackArguments
 {
     double speed = 1.0;
+    std::optional<double> duration; ///< seconds; of a live source, which has no end of its own
     int passes = 1;
     std::filesystem::path folder; ///< of the pictures; empty: none are taken
     std::filesystem::path shotsFile;
@@ -24,7 +26,8 @@ struct PlaybackArguments
     int count = 6;
 };
 
-/// A replay through the idle loop, as a user at a window would see it, with pictures taken in passing.
+/// A replay, or runs of a live source, through the idle loop, as a user at a window would see it, with pictures taken
+/// in passing.
 class Playback
 {
 public:
@@ -47,6 +50,9 @@ private:
     void WriteContactSheet();
     void PrintResult(double seconds) const;
     double CurrentTime() const;
+    std::optional<TimeSpan> Span() const;
+    bool Begin();
+    bool GoesOn() const;
     double SecondsSinceStart() const;
 
     Session& session;
@@ -55,6 +61,7 @@ private:
     PlaybackArguments arguments;
     std::size_t nextShot = 0;
     std::int64_t start = 0; ///< counter of the clock
+    double passStart = 0.0; ///< seconds since `start`
     std::uint64_t frames = 0;
     double played = 0.0;
     std::uint32_t lastProgress = 0;

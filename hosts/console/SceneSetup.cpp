@@ -108,13 +108,16 @@ VtCPanoramicDocument* OpenScene(Session& session, const SceneArguments& scene)
     // The data come first: a body finds its channel by name only where there are channels.
     if (!scene.data.empty() && !LoadData(session, scene.data))
         return nullptr;
+    if (!scene.source.empty() && !ChooseSource(session, scene.source))
+        return nullptr;
     if (!scene.file.empty())
         return session.OpenDocument(Complete(scene.file));
     VtCPanoramicDocument* document = session.NewDocument();
     if (!document)
         return nullptr;
     BuildBodies(session, *document, scene);
-    return scene.data.empty() || BindChannels(session, *document, scene.movables) ? document : nullptr;
+    const bool moves = !scene.data.empty() || !scene.source.empty();
+    return !moves || BindChannels(session, *document, scene.movables) ? document : nullptr;
 }
 
 void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneArguments& scene)
@@ -141,6 +144,60 @@ void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneAr
 bool LoadData(Session& session, const std::filesystem::path& file)
 {
     return session.GetController().LoadMotionData(base::InnerPath(Complete(file)));
+}
+
+bool ChooseSource(Session& session, const std::string& source)
+{
+    const std::size_t colon = source.find(':');
+    const std::string given = source.substr(0, colon);
+    const std::wstring name = base::Wide(given);
+    VtCSimulationDataController& controller = session.GetController();
+    VtCSimulationDataRouter& router = controller.GetRouter();
+    SimulationDataPoints::VtCSimulationDataPoint* point = router.FindPoint(name);
+    if (!point || !point->IsSource())
+    {
+        session.GetHost().ShowError(messageNoSource, given,
+                                    Joined(router.GetPointNames(VtCSimulationDataRouter::sources)));
+        return false;
+    }
+    if (colon != std::string::npos && !point->Configure(point->GetName(), base::Wide(source.substr(colon + 1)), 1, 0))
+    {
+        if (SimulationDataPoints::VtCMessageStack* stack = point->GetMessageStack())
+        {
+            session.GetApp().GetMessageHandler().ReportStack(*stack);
+            point->ResetMessageStack();
+        }
+        else
+            session.GetHost().ShowError(messageSourceRefuses, given, source.substr(colon + 1));
+        return false;
+    }
+    controller.ChoosePoint(name);
+    return true;
+}
+
+bool RunSourceTo(Session& session, double time)
+{
+    VtCSimulationDataController& controller = session.GetController();
+    VtCSimulationDataRouter& router = controller.GetRouter();
+    if (!router.GetActivePoint()->IsTimeDriven())
+    {
+        session.GetHost().ShowError(messageSourceHasOwnTime, base::Utf8(router.GetActivePointName()));
+        return false;
+    }
+    controller.Start();
+    if (!controller.IsOnline())
+        return false;
+    // A clock that knows only what it is told. The source may need several calls to get there.
+    router.GetClock().StartScaledClock(0.0, 1.0);
+    bool goesOn = true;
+    for (double reached = -1.0; goesOn;)
+    {
+        router.SetCurrentTime(time);
+        goesOn = router.FetchFrames() && router.GetCurrentTime() > reached;
+        reached = std::max(reached, router.GetCurrentTime());
+    }
+    controller.Stop();
+    return session.GetExitStatus() == 0;
 }
 
 bool BindChannels(Session& session, VtCPanoramicDocument& document, const std::vector<MovableArgument>& movables)
@@ -177,6 +234,14 @@ std::optional<TimeSpan> GetTimeSpan(Session& session)
     return span;
 }
 
+bool CheckTime(Session& session, double time, const TimeSpan& span)
+{
+    if (time >= span.first && time <= span.last)
+        return true;
+    session.GetHost().ShowError(messageTimeOutside, base::FormatDouble(time) + " s", SpanText(span));
+    return false;
+}
+
 bool CheckTime(Session& session, double time, const std::filesystem::path& file)
 {
     const std::optional<TimeSpan> span = GetTimeSpan(session);
@@ -185,10 +250,7 @@ bool CheckTime(Session& session, double time, const std::filesystem::path& file)
         session.GetHost().ShowError(messageNoTimeStamps, file.string());
         return false;
     }
-    if (time >= span->first && time <= span->last)
-        return true;
-    session.GetHost().ShowError(messageTimeOutside, base::FormatDouble(time) + " s", SpanText(*span));
-    return false;
+    return CheckTime(session, time, *span);
 }
 
 bool GoToTime(Session& session, double time, const std::filesystem::path& file)

@@ -21,6 +21,7 @@ struct SceneArguments
     std::vector<StaticArgument> statics;
     std::vector<MovableArgument> movables;
     std::filesystem::path data; ///< empty: none
+    std::string source;         ///< "NAME" or "NAME:OPTIONS" of a live data point in place of `data`; empty: none
 };
 
 /// Opens the scene with its data. Null after an error message.
@@ -33,6 +34,14 @@ void BuildBodies(Session& session, VtCPanoramicDocument& document, const SceneAr
 /// Makes a motion data file the active source, with all its frames loaded. False after an error message.
 bool LoadData(Session& session, const std::filesystem::path& file);
 
+/// Makes the data point of `source` the active one, with its options if there are any. False after an error message
+/// that names the points, or what the point has against the options.
+bool ChooseSource(Session& session, const std::string& source);
+
+/// Lets the live source run to `time` without anybody waiting for it, and stops it. False after an error message, also
+/// for a source that isn't driven by the clock.
+bool RunSourceTo(Session& session, double time);
+
 /// Binds each movable body to its channel of the active source, names compared without regard to case. False after
 /// an error message, which names the channels there are.
 bool BindChannels(Session& session, VtCPanoramicDocument& document, const std::vector<MovableArgument>& movables);
@@ -44,6 +53,9 @@ struct TimeSpan
     double last = 0.0;
 };
 std::optional<TimeSpan> GetTimeSpan(Session& session);
+
+/// Is `time` within `span`? False after an error message that names the span.
+bool CheckTime(Session& session, double time, const TimeSpan& span);
 
 /// Is `time` within the data? False after an error message that names the span, or says that there are no times.
 bool CheckTime(Session& session, double time, const std::filesystem::path& file);

@@ -28,6 +28,8 @@ struct Snapshot
 
 bool GoToMoment(Session& session, const Snapshot& snapshot)
 {
+    if (!snapshot.view.scene.source.empty())
+        return RunSourceTo(session, *snapshot.time);
     if (snapshot.view.scene.data.empty())
         return true;
     return snapshot.time ? GoToTime(session, *snapshot.time, snapshot.view.scene.data)
@@ -62,13 +64,18 @@ int Run(const Snapshot& snapshot)
 void Check(Snapshot& snapshot)
 {
     const bool hasMoment = !snapshot.timeText.empty() || snapshot.frame != 0;
-    if (snapshot.view.scene.data.empty() == hasMoment)
+    const bool live = !snapshot.view.scene.source.empty();
+    if (live && (snapshot.timeText.empty() || snapshot.frame != 0))
+        RejectArguments("--source needs --time");
+    if (!live && snapshot.view.scene.data.empty() == hasMoment)
         RejectArguments(hasMoment ? "--time and --frame need --data" : "--data needs --time or --frame");
     if (!snapshot.timeText.empty())
     {
         snapshot.time = base::ParseDouble(snapshot.timeText);
         if (!snapshot.time)
             RejectArguments("--time: \"" + snapshot.timeText + "\" is not a number");
+        if (live && *snapshot.time < 0.0)
+            RejectArguments("--time: a live source begins at 0");
     }
     CheckViewArguments(snapshot.view);
     CheckOutput(snapshot.output, Content::picture, InputsOf(snapshot.view.scene));

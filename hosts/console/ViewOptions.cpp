@@ -95,6 +95,11 @@ void AddViewOptions(CLI::App& command, ViewArguments& arguments)
 {
     AddSceneFileOption(command, arguments.scene);
     AddSceneOptions(command, arguments.scene);
+    command
+        .add_option("--source", arguments.scene.source,
+                    "A live data point in place of --data, with its options: OffSim:seed=7,fail=12.5.")
+        ->type_name("POINT[:OPTIONS]")
+        ->excludes("--data");
     AddPlaceOptions(command, arguments);
     CLI::Option* pane = command.add_option("--pane", arguments.pane, "Show this pane of the scene, 1 to 4, alone.")
                             ->type_name("N")

@@ -45,6 +45,47 @@ TEST_F(PlayCommand, PassesAndSpeedMultiply)
     EXPECT_NE(result.error.find("--headless"), std::string::npos) << "that there is no window is told";
 }
 
+TEST_F(PlayCommand, ALiveSourceRunsWithItsOptions)
+{
+    const std::vector<std::string> scene{
+        "--movable", "Car=car.dae:Vehicle", "--size", "160x90", "--eye", "0,0,10", "--look", "0,0.01,0"};
+    const auto run = [&](std::vector<std::string> all)
+    {
+        all.insert(all.end(), scene.begin(), scene.end());
+        return Run(all);
+    };
+    const Result played = run({"play", "--source", "OffSim:seed=3,fail=90", "--duration", "1.5", "--headless",
+                               "--pictures", "out", "--count", "2"});
+    EXPECT_EQ(played.status, 0) << played.error;
+    double data = 0;
+    ASSERT_EQ(sscanf(played.out.c_str(), "%*d frames in %*f s: %*f fps; %lf s of data", &data), 1) << played.out;
+    EXPECT_NEAR(data, 1.5, 0.4);
+    EXPECT_TRUE(HasFileLike("contact-sheet.png"));
+
+    // Nobody waits for the time of a picture: three minutes of driving.
+    const Result far = run({"snapshot", "--source", "OffSim", "--time", "180", "-o", "far.png"});
+    EXPECT_EQ(far.status, 0) << far.error;
+    const Result near = run({"snapshot", "--source", "OffSim:seed=3", "--time", "0", "-o", "near.png"});
+    EXPECT_EQ(near.status, 0) << near.error;
+    EXPECT_TRUE(IsRed(At(*ReadPicture(folder.path / "near.png"), 0.5, 0.5))) << "at the start line";
+    EXPECT_TRUE(IsSky(At(*ReadPicture(folder.path / "far.png"), 0.5, 0.5))) << "out on the course";
+
+    struct Wrong
+    {
+        const char* source;
+        const char* told;
+    };
+    for (const Wrong& wrong : {Wrong{"OffSim:pace=2", "there are seed=NUMBER, fail=SECONDS and recover=SECONDS"},
+                               {"OnSim", "There are: File, OffSim"},
+                               {"File:none.mdf", "no motion data file to read or write"},
+                               {"OffSim:fail=0", "can't be opened"}})
+    {
+        const Result result = run({"snapshot", "--source", wrong.source, "--time", "1", "-o", "p.png"});
+        EXPECT_EQ(result.status, 1) << wrong.source;
+        EXPECT_NE(result.error.find(wrong.told), std::string::npos) << result.error;
+    }
+}
+
 TEST_F(PlayCommand, ShotsAreTakenWhenTheRunPassesThem)
 {
     folder.Write(
