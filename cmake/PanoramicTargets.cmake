@@ -47,6 +47,37 @@ function(panoramic_headers target scope prefix)
     file(MAKE_DIRECTORY "${above}")
     file(CREATE_LINK "${folder}" "${root}/${prefix}" SYMBOLIC)
     target_include_directories(${target} ${scope} "${root}")
+    if(NOT scope STREQUAL "PRIVATE")
+        set_property(GLOBAL APPEND PROPERTY panoramic_folders "${target}|${prefix}|${folder}")
+    endif()
+endfunction()
+
+# panoramic_test_directions(): a test that no folder sees a header of one that is added after it, for the folders that
+# panoramic_headers has been told of. To be called last.
+function(panoramic_test_directions)
+    get_property(folders GLOBAL PROPERTY panoramic_folders)
+    set(lines "")
+    foreach(folder IN LISTS folders)
+        string(REGEX REPLACE "[|].*" "" target "${folder}")
+        get_target_property(type ${target} TYPE)
+        set(property INCLUDE_DIRECTORIES)
+        if(type STREQUAL INTERFACE_LIBRARY)
+            set(property INTERFACE_INCLUDE_DIRECTORIES)
+        endif()
+        string(APPEND lines "${folder}|$<JOIN:$<TARGET_PROPERTY:${target},${property}>,|>\n")
+    endforeach()
+    file(GENERATE OUTPUT "${CMAKE_BINARY_DIR}/directions.txt" CONTENT "${lines}")
+    add_test(NAME directions_tests
+        COMMAND python3 "${CMAKE_SOURCE_DIR}/tests/directions.py" "${CMAKE_BINARY_DIR}/directions.txt" "${CMAKE_CXX_COMPILER}")
+endfunction()
+
+# Several sources of a library or program are compiled as one: most of a source's time goes into the headers of the scene
+# graph library, and what those instantiate comes once for all. Tests stay apart, for they change one by one.
+function(panoramic_unite_sources target)
+    if(PANORAMIC_UNITY)
+        set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_BATCH_SIZE 8)
+        target_compile_options(${target} PRIVATE -Wshadow=local)
+    endif()
 endfunction()
 
 # panoramic_library(NAME PREFIX scene SOURCES a.cpp ... LINKS lower ...): a static library whose headers are seen under
@@ -56,6 +87,7 @@ function(panoramic_library name)
     add_library(${name} STATIC ${arg_SOURCES})
     panoramic_headers(${name} PUBLIC ${arg_PREFIX})
     target_link_libraries(${name} PUBLIC ${arg_LINKS})
+    panoramic_unite_sources(${name})
 endfunction()
 
 # panoramic_test(NAME SOURCES a.cpp ... LINKS lib ...): one test program, one ctest entry.

@@ -1,9 +1,12 @@
 #!/usr/bin/env bash
-# Installs the packages of tools/packages.txt that this machine lacks. Quiet when there is nothing to do.
+# Installs the packages of tools/packages.txt that this machine lacks; tools/setup.sh run: only those in front of the
+# heading "tests". Quiet when there is nothing to do.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
-mapfile -t wanted < <(sed -e 's/#.*//' -e 's/[[:space:]]//g' tools/packages.txt | grep -v '^$')
+last=()
+[ "${1:-}" = run ] && last=(-e '/^# tests/,$d')
+mapfile -t wanted < <(sed "${last[@]}" -e 's/#.*//' -e 's/[[:space:]]//g' tools/packages.txt | grep -v '^$')
 missing=()
 for package in "${wanted[@]}"; do
     dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q 'ok installed' || missing+=("$package")

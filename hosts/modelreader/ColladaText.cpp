@@ -17,7 +17,7 @@
 namespace
 {
 
-constexpr int maxDepth = 300;
+constexpr int deepestElement = 300;
 constexpr std::uint64_t maxNodes = 1000000;
 
 /// Everything of the file by name, found in one walk that doesn't recurse.
@@ -26,7 +26,7 @@ class Elements : public pugi::xml_tree_walker
 public:
     bool for_each(pugi::xml_node& element) override
     {
-        if (depth() > maxDepth)
+        if (depth() > deepestElement)
             throw std::runtime_error("its elements are nested too deeply");
         if (element.type() == pugi::node_element)
         {
@@ -85,7 +85,7 @@ public:
 private:
     std::uint64_t Count(pugi::xml_node node, int depth)
     {
-        if (depth > maxDepth)
+        if (depth > deepestElement)
             throw std::runtime_error("its nodes are nested too deeply");
         if (const auto known = counts.find(node.internal_object()); known != counts.end())
             return known->second;

@@ -19,7 +19,7 @@
 namespace
 {
 
-constexpr int maxDepth = 600;
+constexpr int deepestNode = 600;
 constexpr std::uint64_t maxPaths = 2000000;
 
 /// The empty node of `source`'s kind, children to be added. Null for what has no place in a model.
@@ -153,7 +153,7 @@ osg::ref_ptr<osg::Group> GraphBuilder::Build(osg::Node& root, bool hasTurnedRoot
 
 GraphBuilder::Built GraphBuilder::BuildNode(osg::Node& source, const Inherited& above, int depth)
 {
-    if (depth > maxDepth)
+    if (depth > deepestNode)
         throw std::runtime_error("its nodes are nested too deeply");
 
     Inherited inherited = above;

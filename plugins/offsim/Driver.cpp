@@ -11,7 +11,7 @@ namespace offsim
 namespace
 {
 
-constexpr double wantedCell = 1.0;
+constexpr double planCell = 1.0;
 constexpr double speedGain = 1.5;      // 1/s
 constexpr double speedPreview = 0.12;  // s, about the lag of the pedals
 constexpr double steerPreview = 0.14;  // s, about the lag of steering and tyres
@@ -32,7 +32,7 @@ Driver::Driver(const Course& onCourse, const VehicleParameters& vehicle)
       understeer((1.0 / vehicle.frontStiffness - 1.0 / vehicle.rearStiffness) / gravity),
       wheelbase(vehicle.wheelbase)
 {
-    const auto cells = static_cast<std::size_t>(std::ceil(course->Length() / wantedCell));
+    const auto cells = static_cast<std::size_t>(std::ceil(course->Length() / planCell));
     cell = course->Length() / static_cast<double>(cells);
     allowed.resize(cells);
     for (std::size_t i = 0; i < cells; ++i)

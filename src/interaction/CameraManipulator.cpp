@@ -15,9 +15,9 @@ constexpr float turnFactor = 0.01f;
 constexpr float attachedPanFactor = 0.02f; // an offset on a moving body wants a finer hand
 constexpr float attachedMoveFactor = 0.2f;
 
-const osg::Vec3d xAxis(1, 0, 0);
-const osg::Vec3d yAxis(0, 1, 0);
-const osg::Vec3d zAxis(0, 0, 1);
+const osg::Vec3d alongX(1, 0, 0);
+const osg::Vec3d alongY(0, 1, 0);
+const osg::Vec3d alongZ(0, 0, 1);
 
 int Sign(float value)
 {
@@ -218,9 +218,9 @@ void VtCOsgCameramanipulator::Pan(bool freely)
     const double a = deltaX * moveSpeed * moveFactor;
     const double b = deltaY * moveSpeed * moveFactor;
     if (freely)
-        position += osg::Vec3f(Normalised(rotation * xAxis) * a + zAxis * b);
+        position += osg::Vec3f(Normalised(rotation * alongX) * a + alongZ * b);
     else
-        offsetPosition += osg::Vec3f(xAxis * a + yAxis * b);
+        offsetPosition += osg::Vec3f(alongX * a + alongY * b);
 }
 
 void VtCOsgCameramanipulator::Roll(bool freely)
@@ -228,9 +228,9 @@ void VtCOsgCameramanipulator::Roll(bool freely)
     const double a = -deltaX * turnSpeed;
     const double b = -deltaY * turnSpeed;
     if (freely)
-        rotation = rotation * (osg::Quat(b, rotation * xAxis) * osg::Quat(a, rotation * zAxis));
+        rotation = rotation * (osg::Quat(b, rotation * alongX) * osg::Quat(a, rotation * alongZ));
     else
-        offsetRotation = offsetRotation * (osg::Quat(b, xAxis) * osg::Quat(a, zAxis));
+        offsetRotation = offsetRotation * (osg::Quat(b, alongX) * osg::Quat(a, alongZ));
 }
 
 void VtCOsgCameramanipulator::Drive(bool freely)
@@ -239,13 +239,13 @@ void VtCOsgCameramanipulator::Drive(bool freely)
     const double b = -moveSpeed * deltaY * moveFactor;
     if (freely)
     {
-        rotation = rotation * osg::Quat(a, zAxis);
-        position += osg::Vec3f(Normalised(rotation * zAxis) * b);
+        rotation = rotation * osg::Quat(a, alongZ);
+        position += osg::Vec3f(Normalised(rotation * alongZ) * b);
     }
     else
     {
-        offsetRotation = offsetRotation * osg::Quat(a, yAxis);
-        offsetPosition += osg::Vec3f(zAxis * b);
+        offsetRotation = offsetRotation * osg::Quat(a, alongY);
+        offsetPosition += osg::Vec3f(alongZ * b);
     }
 }
 
@@ -287,7 +287,7 @@ void VtCOsgCameramanipulator::WriteBack()
 void VtCOsgCameramanipulator::straighten()
 {
     osg::Quat level;
-    level.makeRotate(rotation * yAxis, zAxis);
+    level.makeRotate(rotation * alongY, alongZ);
     rotation = rotation * level;
     if (!DrivesFreely())
         return;
@@ -315,7 +315,7 @@ void frameNode(osgViewer::View* view, const osg::Node* node)
     osgGA::CameraManipulator* manipulator = view->getCameraManipulator();
     osg::Matrixd matrix = manipulator ? manipulator->getMatrix() : view->getCamera()->getInverseViewMatrix();
     const double radius = node->getBound().radius();
-    const osg::Vec3d back = Normalised(matrix.getRotate() * zAxis) * (2 * radius);
+    const osg::Vec3d back = Normalised(matrix.getRotate() * alongZ) * (2 * radius);
     const osg::Vec3d origin = osg::computeLocalToWorld(node->getParentalNodePaths().front(), true).getTrans();
     matrix.setTrans(origin.x() + back.x(), origin.y() + back.y(), origin.z() + 0.5 * radius);
 

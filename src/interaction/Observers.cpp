@@ -17,7 +17,6 @@ namespace
 
 constexpr std::uint32_t textFollowModes = 6221;
 constexpr std::uint32_t messageNoBodies = 304;
-constexpr double quarterTurn = 1.5707963267948966;
 constexpr std::size_t modelEndingLength = 4; // ".dae"
 
 // The numbers of `text`, separated by blanks; what is missing or no number is 0.
@@ -189,7 +188,7 @@ void VtC3DObservers::LoadFreeObserver(VtC3DObserver* observer, int number, const
         const osg::Quat orientation(q[0], q[1], q[2], q[3]);
         const osg::Vec3d xAxis(1, 0, 0);
         observer->StoreFreeView(observer->GetPosition(),
-                                osg::Quat(-quarterTurn, xAxis) * orientation * osg::Quat(quarterTurn, xAxis));
+                                osg::Quat(-osg::PI_2, xAxis) * orientation * osg::Quat(osg::PI_2, xAxis));
         observer->PushViewMatrix();
     }
 }

@@ -9,14 +9,14 @@ namespace
 {
 
 constexpr unsigned maxVertices = 50000000;
-constexpr float nearlySame = 1e-6f; ///< square of a step of colour that no screen shows
-constexpr float farthest = 1e12f;   ///< metres; beyond it products of coordinates overflow
+constexpr float nearlySame = 1e-6f;    ///< square of a step of colour that no screen shows
+constexpr float farthestPlace = 1e12f; ///< metres; beyond it products of coordinates overflow
 
 template <class Vector>
 bool IsSound(const Vector& value)
 {
     for (int i = 0; i < Vector::num_components; ++i)
-        if (!(std::fabs(value[i]) <= farthest))
+        if (!(std::fabs(value[i]) <= farthestPlace))
             return false;
     return true;
 }

@@ -15,7 +15,7 @@ namespace SimulationDataPoints
 namespace
 {
 
-constexpr std::size_t blockBytes = 1 << 20;
+constexpr std::size_t readBytes = 1 << 20;
 constexpr std::size_t maxLineBytes = 64 << 20;
 constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
 
@@ -69,7 +69,7 @@ bool VtCCsvLines::Fill()
         end -= begin;
         begin = 0;
     }
-    const std::size_t room = std::min<std::uint64_t>(blockBytes, fileBytes + 1);
+    const std::size_t room = std::min<std::uint64_t>(readBytes, fileBytes + 1);
     if (buffer.size() < end + room)
         buffer.resize(end + room);
     ssize_t got = 0;
