@@ -208,6 +208,8 @@ TEST_F(Attributes, AWriteToTheRecordReachesTheObjectOnce)
         {
             if (subject.owner == observer && *row.name == attribute::behaviour)
                 return; // below
+            const std::wstring* formerName = subject.record->Find<std::wstring>(attribute::name);
+            const std::wstring name = formerName ? *formerName : std::wstring();
             const Listener listener(*subject.record);
             document->SetModified(false);
             const VtTAttributeValue sample = SampleOf(row);
@@ -222,6 +224,8 @@ TEST_F(Attributes, AWriteToTheRecordReachesTheObjectOnce)
             ExpectOnce(listener, *row.name);
             EXPECT_FALSE(document->IsModified()) << "nothing has changed";
             ExpectAgreement();
+            if (*row.name == attribute::name)
+                subject.record->Write(attribute::name, name); // others are found by it
         });
     observer->GetAttributeObject()->Write(attribute::behaviour, 4);
     ExpectAgreement();
@@ -301,7 +305,9 @@ TEST_F(Attributes, ASetterWritesTheRecordOnce)
     add(1, "scaling axes", {attribute::scaleOrient}, [&] { fixed->SetScaleOrientation(osg::Vec3f(1, 2, 3)); });
     add(2, "name", {attribute::name}, [&] { observer->SetName(L"Eye"); });
     add(2, "mode by name", {attribute::behaviour}, [&] { observer->SetFollowMode(L"Fixed_to_Body"); });
-    add(2, "mode by number", {attribute::behaviour}, [&] { observer->SetFollowModeIndex(followFree); });
+    // One that becomes free keeps looking from where it was.
+    add(2, "mode by number", {attribute::behaviour, attribute::position, attribute::orientation},
+        [&] { observer->SetFollowModeIndex(followFree); });
     add(2, "body", {attribute::attachedTo}, [&] { observer->SetConnectedBody(leader); });
     add(2, "no body", {attribute::attachedTo}, [&] { observer->Disconnect(); });
     add(2, "offset", {attribute::translation}, [&] { observer->SetTranslationOffset(osg::Vec3f(1, 2, 3)); });
