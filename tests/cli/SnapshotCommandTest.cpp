@@ -167,6 +167,7 @@ TEST_F(SnapshotCommand, AnOutputCostsNothingThatWasThere)
     fs::create_symlink("run.mdf", folder.path / "link.png");
     fs::create_hard_link(folder.path / "scene.xml", folder.path / "hard.xml");
     folder.Write("place.args", "--eye\n5,0,10\n--look\n5,0,0\n--size\n16x9\n");
+    folder.Write("scene.args", "--eye\n5,0,10\n--look\n5,0,0\n");
     folder.Write("old.png", "old");
     fs::create_symlink("old.png", folder.path / "to_old.png");
 
@@ -191,7 +192,7 @@ TEST_F(SnapshotCommand, AnOutputCostsNothingThatWasThere)
         {{"scene", "copy", "scene.xml", "-o", "scene.xml"}, 2, "scene.xml"},
         {{"scene", "copy", "scene.xml", "-o", "hard.xml"}, 2, "scene.xml"},
         {{"scene", "copy", "scene.xml", "-o", "p.png"}, 2, ".xml"},
-        {{"scene", "new", "@place.args", "-o", "place.args"}, 2, "place.args"},
+        {{"scene", "new", "@scene.args", "-o", "scene.args"}, 2, "scene.args"},
         {{"scene", "new", "--static", "models/car.dae", "-o", "models/Imported.xml"}, 1, "Imported.xml"},
         {{"mdf", "export", "run.mdf", "-o", "run.mdf"}, 2, ".csv"},
         {{"mdf", "export", "run.mdf", "-o", "car.dae"}, 2, ".csv"},
@@ -199,7 +200,7 @@ TEST_F(SnapshotCommand, AnOutputCostsNothingThatWasThere)
     const auto contents = [&]
     {
         std::string all;
-        for (const char* file : {"run.mdf", "scene.xml", "place.args", "car.dae", "models/Imported.xml"})
+        for (const char* file : {"run.mdf", "scene.xml", "scene.args", "car.dae", "models/Imported.xml"})
             all += TemporaryFolder::Read(folder.path / file) + "\n";
         return all;
     };
