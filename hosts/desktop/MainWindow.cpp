@@ -288,13 +288,19 @@ void MainWindow::MoveFocus(int step)
             stops.push_back(&area->GetPaneWindow(pane));
     const std::ptrdiff_t shownPanes = std::ssize(stops);
     for (QDockWidget* dock : {static_cast<QDockWidget*>(controllerDock), logDock})
-        if (dock && dock->isVisible())
-            for (QWidget* inside : dock->widget()->findChildren<QWidget*>() << dock->widget())
-                if (inside->isEnabled() && inside->isVisible() && (inside->focusPolicy() & Qt::TabFocus))
-                {
-                    stops.push_back(inside);
-                    break;
-                }
+    {
+        if (!dock || !dock->isVisible())
+            continue;
+        QList<QWidget*> insides = dock->widget()->findChildren<QWidget*>();
+        insides.prepend(dock->widget());
+        const auto first = std::find_if(insides.begin(), insides.end(),
+                                        [](const QWidget* inside) {
+                                            return inside->isEnabled() && inside->isVisible() &&
+                                                   (inside->focusPolicy() & Qt::TabFocus);
+                                        });
+        if (first != insides.end())
+            stops.push_back(*first);
+    }
     if (stops.empty())
         return;
 

@@ -158,6 +158,17 @@ class WindowTest(unittest.TestCase):
         self.screen.key("Home")
         self.application.wait(lambda s: s["frame"] == 1 and not s["actions"]["38746"]["enabled"], "the first frame")
 
+    def test_the_keyboard_goes_round_panes_and_docks_also_of_the_next_scene(self) -> None:
+        self.start_example()
+        for pane in (1, 2, 3, 4, 4, 4, 1):  # the two docks lie between the last pane and the first
+            self.screen.key("F6")
+            self.application.wait(lambda s, p=pane: s["panes"][p - 1]["active"], f"pane {pane} is the active one")
+        self.screen.key("Control_L+n")
+        self.application.wait(lambda s: s["views_created"] and not s["bodies"], "a new scene")
+        for pane in (1, 2):
+            self.screen.key("F6")
+            self.application.wait(lambda s, p=pane: s["panes"][p - 1]["active"], f"pane {pane} of the new scene")
+
     def test_a_replay_has_to_be_stopped_before_the_program_ends(self) -> None:
         self.start_example("--play")
         self.application.wait(lambda s: s["play_state"] != "stopped", "it plays")
