@@ -91,6 +91,18 @@ void VtCSceneObjectStore::AddObject(const std::wstring& id, VtISceneObject* obje
         at->second->second = object;
 }
 
+void VtCSceneObjectStore::RenameObject(const std::wstring& id, const std::wstring& newId)
+{
+    const auto at = byId.find(id);
+    if (at == byId.end())
+        return;
+    const Records::iterator record = at->second;
+    byId.erase(at);
+    RemoveObject(newId);
+    record->first = newId;
+    byId.emplace(newId, record);
+}
+
 std::wstring VtCSceneObjectStore::GetDefaultText(std::int32_t objectType) const
 {
     const osg::ref_ptr<VtISceneObject> object = MakeDefaultObject(objectType);

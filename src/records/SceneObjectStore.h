@@ -51,6 +51,10 @@ public:
     /// Stores `object` under `id`, in the place of one that stood there. Null removes.
     virtual void AddObject(const std::wstring& id, VtISceneObject* object) = 0;
 
+    /// The record under `id` is found under `newId` from now on, at the place where it stands; one that stood under
+    /// `newId` goes. Nothing without a record under `id`.
+    virtual void RenameObject(const std::wstring& id, const std::wstring& newId) = 0;
+
     /// The textual form of a new record of that type; empty for a type that has no default record.
     virtual std::wstring GetDefaultText(std::int32_t objectType) const = 0;
 
@@ -91,6 +95,7 @@ public:
     void RemoveObject(const std::wstring& id) override;
     void Clear() override;
     void AddObject(const std::wstring& id, VtISceneObject* object) override;
+    void RenameObject(const std::wstring& id, const std::wstring& newId) override;
     std::wstring GetDefaultText(std::int32_t objectType) const override;
     osg::ref_ptr<VtISceneObject> MakeDefaultObject(std::int32_t objectType) const override;
     bool LoadFile(const std::wstring& path) override;

@@ -1,4 +1,5 @@
 // How the records of a scene's own objects are built: its render settings and its bodies.
+#include "base/Text.h"
 #include "records/RecordTables.h"
 #include "records/SceneObjectStore.h"
 #include "scene/MovableBody.h"
@@ -52,15 +53,21 @@ void BuildRenderSettings(VtCSceneLoad& load, const Records& records)
     const auto mode = static_cast<VtERenderMode>(number);
     scene.SetGlobalRenderMode(mode, mode == VtERenderMode::Mixed);
 
-    // One record is left of the scene's own and those of the file; two of one id could not be read again.
+    if (!own)
+        return;
+    // One record is left of the scene's own and those of the file; two of one id could not be read again. It stands
+    // where that of the file stood, so that the next save gives the same file.
     VtISceneObjectStore& store = load.GetServices().store;
+    const std::wstring ownId = TextOf(*own, L"internal_id");
+    const std::wstring place = records.empty() ? ownId : TextOf(*records.back(), L"internal_id");
+    for (const std::wstring& id : {ownId, std::wstring(renderSettingsKey)})
+        if (store.GetObject(id) == own && !base::EqualsNoCase(id, place))
+            store.RemoveObject(id);
     for (const auto& record : records)
-        store.RemoveObject(TextOf(*record, L"internal_id"));
-    if (own)
-    {
-        store.RemoveObject(TextOf(*own, L"internal_id"));
-        store.AddObject(renderSettingsKey, own);
-    }
+        if (const std::wstring id = TextOf(*record, L"internal_id"); !base::EqualsNoCase(id, place))
+            store.RemoveObject(id);
+    store.AddObject(place, own);
+    store.RenameObject(place, renderSettingsKey);
 }
 
 // The parts of a group have records of their own and are built as independent bodies; clones are made by their track.

@@ -139,7 +139,7 @@ TEST_F(SceneLoader, UnknownRecordsAndAttributesAreWrittenAgainAtTheirPlace)
     std::size_t at = 0;
     for (const std::string& next :
          {unknown[0], std::string(">car<"), std::string("later_attribute"), unknown[1], std::string(">house<"),
-          unknown[2], std::string(">o<"), unknown[3], std::string("kept too")})
+          unknown[2], std::string(">o<"), std::string("kept too"), unknown[3]})
     {
         const std::size_t found = saved.find(next, at);
         ASSERT_NE(found, std::string::npos) << next;
